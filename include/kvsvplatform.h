@@ -1,0 +1,127 @@
+/*
+ * kvsvplatform.h: the operations that the library calls. The host's (sv...) are resolved from the
+ * process that loads the library; the driver's (kv..., kvdb..., kvhdn...) come from libkvor.so.1.
+ */
+#ifndef KVSVPLATFORM_H
+#define KVSVPLATFORM_H
+
+#include <stddef.h>
+#include <stdint.h>
+
+#include "kvorproperties.h"
+#include "kvsvapi.h"
+
+#ifdef __cplusplus
+extern "C" {
+#endif
+
+/* ==== Host runtime ========================================================================== */
+
+/* Opaque host path. */
+typedef struct SvPathRecord *SvPath;
+
+/* Cookie of a registered host reference. */
+typedef uint64_t SvRefnum;
+
+/* A clean-up procedure runs with the argument given at registration when the program stops. */
+typedef int32_t (*SvCleanupProc)(uint64_t argument);
+
+/* Memory. Handles are zero-filled; a resize may move the block. */
+SvHandle svNewHandleClr(size_t size);
+int32_t svSetHandleSizeClr(SvHandle handle, size_t size);
+size_t svGetHandleSize(SvHandle handle);
+int32_t svDisposeHandle(SvHandle handle);
+int32_t svCopyHandle(SvHandle *destination, SvHandle source);
+void svCopyBytes(const void *source, void *destination, size_t size);
+
+/* Strings. svStrPrintf resizes the string handle as needed; non-negative on success. */
+int32_t svStrPrintf(SvHandle string, const char *format, ...);
+int32_t svStrCaseCmp(const SvStr *a, const SvStr *b);
+int32_t svStrFromPtr(SvHandle *string, int32_t length, const void *bytes);
+
+/* Sets a string attribute of the variant at `variant`. `attributeName` is length-prefixed (one
+ * length byte, then the text). The text is copied; the caller keeps `value`. */
+int32_t svVariantSetStringAttr(void *variant, const unsigned char *attributeName, SvHandle value);
+
+/* Paths. */
+SvPath svEmptyPath(int32_t flags);
+int32_t svAppPath(SvPath path);
+int32_t svDestroyPath(SvPath path);
+int32_t svPathToString(SvPath path, SvHandle *text);
+int32_t svStringToPath(SvHandle text, SvPath *path);
+SvHandle svPathCText(SvPath path);
+
+/* Run mode: each non-zero for yes. */
+int32_t svIsBoundApp(int32_t reserved);
+int32_t svIsRunTime(int32_t reserved);
+int32_t svIsFullFeatureRunTime(int32_t reserved);
+
+/* References. All text arguments are string handles; the numbers are protocol constants. */
+int32_t svRegisterRefKind3(SvHandle name, uint32_t handle, SvHandle kind, SvHandle className,
+                           int32_t c21, SvRefnum *reference, int32_t c8, SvHandle libraryPattern,
+                           int32_t c1, SvHandle openName, SvHandle closeName, int32_t z0,
+                           int32_t z1, int32_t keep);
+int32_t svUnregisterRef(SvRefnum reference);
+/* Not every host has it: the library looks it up at run time. */
+typedef int32_t (*SvUnregisterRefByNameProc)(SvHandle name, SvHandle kind, SvHandle className,
+                                             int32_t c21);
+
+/* Registers a clean-up procedure for the running program. */
+int32_t svSetCleanupProc(SvCleanupProc procedure, uint64_t argument, int32_t mode);
+
+/* ==== Driver ================================================================================ */
+
+/* Session modes. */
+enum kvSessionMode {
+  kvMode_SignalInSinglePoint = 0,
+  kvMode_SignalInWaveform = 1,
+  kvMode_SignalInXY = 2,
+  kvMode_SignalOutSinglePoint = 3,
+  kvMode_SignalOutWaveform = 4,
+  kvMode_SignalOutXY = 5,
+  kvMode_FrameInStream = 6,
+  kvMode_FrameInQueued = 7,
+  kvMode_FrameInSinglePoint = 8,
+  kvMode_FrameOutStream = 9,
+  kvMode_FrameOutQueued = 10,
+  kvMode_FrameOutSinglePoint = 11,
+  kvMode_SignalConversionSinglePoint = 12
+};
+
+/* Protocols. */
+enum kvProtocol { kvProtocol_CAN = 0, kvProtocol_FlexRay = 1, kvProtocol_LIN = 2, kvProtocol_Ethernet = 3 };
+
+/* Sessions. */
+int32_t kvCreateSession(const char *database, const char *cluster, const char *list,
+                        const char *interfaceName, uint32_t mode, uint32_t *session);
+int32_t kvClear(uint32_t session);
+/* A handle that stands for a failed open and answers every call with `status`. */
+int32_t kvhdnCreateErrorSession(int32_t status, uint32_t *session);
+int32_t kvWait(uint32_t session, uint32_t condition, uint32_t parameter, uint32_t *parameterOut,
+               double timeout);
+
+/* Status text. */
+void kvStatusToString(int32_t status, uint32_t size, char *text);
+
+/* System. */
+int32_t kvSystemOpen(uint32_t *system);
+int32_t kvSystemClose(uint32_t system);
+
+/* Properties of sessions and system objects. */
+int32_t kvGetPropertySize(uint32_t object, uint32_t id, uint32_t *size);
+int32_t kvGetProperty(uint32_t object, uint32_t id, uint32_t size, void *value);
+int32_t kvSetProperty(uint32_t object, uint32_t id, uint32_t size, const void *value);
+int32_t kvGetSubProperty(uint32_t object, uint32_t index, uint32_t id, uint32_t size, void *value);
+int32_t kvSetSubProperty(uint32_t object, uint32_t index, uint32_t id, uint32_t size,
+                         const void *value);
+
+/* Signals. Buffer sizes are in bytes. */
+int32_t kvReadSignalSinglePoint(uint32_t session, double *values, uint32_t valuesSize,
+                                uint64_t *timestamps, uint32_t timestampsSize);
+int32_t kvWriteSignalSinglePoint(uint32_t session, const double *values, uint32_t valuesSize);
+
+#ifdef __cplusplus
+}
+#endif
+
+#endif
