@@ -13,7 +13,7 @@
 
 namespace {
 
-std::string Run(const std::string &command) {
+std::string Shell(const std::string &command) {
   std::unique_ptr<FILE, int (*)(FILE *)> pipe(popen(command.c_str(), "r"), pclose);
   EXPECT_NE(pipe, nullptr) << command;
   std::string out;
@@ -42,7 +42,7 @@ std::set<std::string> DynamicSymbols(bool defined) {
   const std::string nm = std::string("nm -D ") + (defined ? "--defined-only " : "--undefined-only ") +
                          KVSV_LIBRARY_FILE;
   std::set<std::string> names;
-  std::istringstream lines(Run(nm));
+  std::istringstream lines(Shell(nm));
   std::string line;
   while (std::getline(lines, line)) {
     std::istringstream fields(line);
@@ -57,7 +57,7 @@ std::set<std::string> DynamicSymbols(bool defined) {
 
 TEST(BinaryShape, ExportsExactlyTheFunctionsOfThePublicHeader) {
   const std::set<std::string> declared =
-      Captures(ReadFile(KVSV_PUBLIC_HEADER), std::regex(R"(KVSV_EXPORT[^;(]*\b(\w+)\s*\()"));
+      Captures(ReadFile(KVSV_PUBLIC_HEADER), std::regex(R"(\nKVSV_EXPORT[^;(]*\b(\w+)\s*\()"));
   ASSERT_FALSE(declared.empty());
   for (const std::string &name : declared) EXPECT_EQ(name.rfind("kvsv", 0), 0u) << name;
 
@@ -71,7 +71,7 @@ TEST(BinaryShape, ExportsExactlyTheFunctionsOfThePublicHeader) {
 }
 
 TEST(BinaryShape, NeedsTheDriverBySonameAndNoStandIn) {
-  const std::string dynamic = Run(std::string("readelf -d ") + KVSV_LIBRARY_FILE);
+  const std::string dynamic = Shell(std::string("readelf -d ") + KVSV_LIBRARY_FILE);
   const std::set<std::string> needed =
       Captures(dynamic, std::regex(R"(\(NEEDED\)\s+Shared library: \[([^\]]+)\])"));
   EXPECT_THAT(needed, testing::Contains("libkvor.so.1"));
