@@ -1,0 +1,56 @@
+// The driver: the one object of the process that owns every part of the stand-in.
+#ifndef KVOR_SIM_DRIVER_H
+#define KVOR_SIM_DRIVER_H
+
+#include <cstdint>
+#include <memory>
+
+#include "call_counter.h"
+#include "call_holds.h"
+#include "call_log.h"
+#include "driver_status.h"
+#include "failure_plan.h"
+#include "network.h"
+#include "session_registry.h"
+#include "system_registry.h"
+#include "virtual_clock.h"
+
+namespace nKvorSim {
+
+class Driver {
+ public:
+  static Driver &Instance();
+
+  CallLog &Log() { return log_; }
+  FailurePlan &Failures() { return failures_; }
+  CallHolds &Holds() { return holds_; }
+  CallCounter &Blocked() { return blocked_; }
+  VirtualClock &Clock() { return clock_; }
+  NetworkSet &Networks() { return networks_; }
+  SessionRegistry &Sessions() { return sessions_; }
+  SystemRegistry &Systems() { return systems_; }
+
+  // The open session of `handle` in *session, or the status with which a use of the handle
+  // fails: invalid for a handle that is not open, the error status of an error session.
+  Status UseSession(uint32_t handle, std::shared_ptr<Session> *session);
+  // Ends a session or error session and wakes every call blocked on it.
+  Status ClearSession(uint32_t handle);
+
+  void Reset();
+
+ private:
+  Driver() = default;
+
+  CallLog log_;
+  FailurePlan failures_;
+  CallHolds holds_;
+  CallCounter blocked_;
+  VirtualClock clock_;
+  NetworkSet networks_;
+  SessionRegistry sessions_;
+  SystemRegistry systems_;
+};
+
+}  // namespace nKvorSim
+
+#endif

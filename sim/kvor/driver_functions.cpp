@@ -1,0 +1,33 @@
+#include "driver_functions.h"
+
+namespace nKvorSim {
+
+namespace {
+
+constexpr DriverFunction kFunctions[] = {
+    {"kvCreateSession", true, false},
+    {"kvClear", true, false},
+    {"kvhdnCreateErrorSession", true, false},
+    {"kvWait", true, false},
+    {"kvStatusToString", false, false},
+    {"kvSystemOpen", true, false},
+    {"kvSystemClose", true, false},
+    {"kvGetPropertySize", true, true},
+    {"kvGetProperty", true, true},
+    {"kvSetProperty", true, true},
+    {"kvGetSubProperty", true, true},
+    {"kvSetSubProperty", true, true},
+    {"kvReadSignalSinglePoint", true, false},
+    {"kvWriteSignalSinglePoint", true, false},
+};
+
+}  // namespace
+
+const DriverFunction *FindDriverFunction(std::string_view name) {
+  for (const DriverFunction &function : kFunctions) {
+    if (name == function.name) return &function;
+  }
+  return nullptr;
+}
+
+}  // namespace nKvorSim

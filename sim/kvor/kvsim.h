@@ -1,0 +1,258 @@
+/*
+ * kvsim.h: control of the driver stand-in libkvor.so.1, for tests. Plain C.
+ *
+ * The stand-in is an in-memory driver: one system of two devices whose interfaces are joined in
+ * pairs to virtual networks, sessions with their properties, error sessions, signal values that
+ * travel over a network, a virtual clock, and blocking calls that honour their time limit and
+ * return when their session is cleared. The functions below script it and look inside it. None
+ * of them is a driver call: none goes into the call log, none can be held or made to fail.
+ *
+ * The hardware of the stand-in:
+ *
+ *   device 1 "BusBox 6 CAN/LIN", serial 1001234: CAN1, CAN2, CAN3, CAN4, LIN1, LIN2 (ports 1-6)
+ *   device 2 "BusBox 3 FlexRay/Ethernet", serial 1001235: FlexRay1, FlexRay2, ENET1 (ports 1-3)
+ *
+ * Networks: CAN1-CAN2, CAN3-CAN4, LIN1-LIN2 and FlexRay1-FlexRay2 are wired together; ENET1 is on
+ * its own. Protocols (kvPropIntf_Protocol, kvPropSession_Protocol): 0 CAN, 1 FlexRay, 2 LIN,
+ * 3 Ethernet.
+ *
+ * Handles:
+ *   session and error session  0x20GGIIII: IIII 1..8192 (unique among open sessions), GG a
+ *                              generation that changes each time IIII is handed out again
+ *   system                     0x01SS0000: SS 1..255, one per open system
+ *   device                     0x01SSDD00: DD the device number 1..2
+ *   interface                  0x01SSDD0P: P the port 1..15 on device DD
+ * Device and interface handles are valid while the system SS that listed them is open.
+ *
+ * What the driver functions do here, beyond their declarations in kvsvplatform.h:
+ *
+ *   kvCreateSession   The interface is one of the names above, in any case, optionally followed
+ *                     by "/suffix" ("ENET1/monitor"); the mode is 0..12; the list is cut at
+ *                     commas and each item trimmed (an empty item among others is refused). On
+ *                     failure the handle output is left as it was.
+ *   Session properties  Read-only, from the creation: kvPropSession_Mode, NumInList (items in the
+ *                     list), List (items joined by ","), IntfName (as given), Protocol,
+ *                     DatabaseName, ClusterName. Any other identifier keeps the bytes last set
+ *                     and gives them back; a value never set is kvsimErrPropertyUnknown. Types
+ *                     0x00 and 0x05 take exactly 4 bytes, 0x01 and 0x09 exactly 8, 0x02 exactly
+ *                     1; text types (0x03, 0x04) get a NUL if set without one, and their size
+ *                     counts it. Sub-properties are kept per list item: the index must be below
+ *                     NumInList. A read whose buffer is smaller than the value is refused whole.
+ *   System objects    Read-only: kvPropSys_Ver* (4 bytes), DevRefs, IntfRefs, IntfRefsAll,
+ *                     IntfRefsCAN/FlexRay/LIN/Ethernet (arrays of 4-byte handles);
+ *                     kvPropDev_Name, SerNum, ProductNum, NumPorts, NumPortsAll, IntfRefs,
+ *                     IntfRefsAll; kvPropIntf_Name, Protocol, Num, PortNum, DevRef.
+ *   Error sessions    kvhdnCreateErrorSession takes a negative status only. Every call on the
+ *                     handle returns that status and touches no output, except kvClear and
+ *                     kvSystemClose, which end the error session and return 0.
+ *   Signals           kvReadSignalSinglePoint needs mode 0, kvWriteSignalSinglePoint mode 3;
+ *                     each buffer must hold 8 bytes per signal. Values travel over the session's
+ *                     network by signal name (see kvsimSetSignalValues).
+ */
+#ifndef KVSIM_H
+#define KVSIM_H
+
+#include <stdint.h>
+
+#ifdef __cplusplus
+extern "C" {
+#endif
+
+#define KVSIM_API __attribute__((visibility("default")))
+
+/* The driver's version, as kvPropSys_VerMajor, VerMinor, VerUpdate, VerPhase (3: release) and
+ * VerBuild give it. */
+#define KVSIM_VERSION_MAJOR 24u
+#define KVSIM_VERSION_MINOR 5u
+#define KVSIM_VERSION_UPDATE 0u
+#define KVSIM_VERSION_PHASE 3u
+#define KVSIM_VERSION_BUILD 49u
+
+/* ==== Statuses of the driver ================================================================= */
+
+/* Every error that the stand-in makes; kvStatusToString gives a text for each. */
+enum kvsimStatus {
+  kvsimErrInternal = (int32_t)0xBFF62001,         /* an unexpected failure inside the driver */
+  kvsimErrOutOfMemory = (int32_t)0xBFF62002,      /* the driver could not allocate memory */
+  kvsimErrNullPointer = (int32_t)0xBFF62003,      /* a required pointer argument is null */
+  kvsimErrInvalidArgument = (int32_t)0xBFF62004,  /* an argument is out of range (NaN time limit,
+                                                     non-negative status of an error session) */
+  kvsimErrInvalidSession = (int32_t)0xBFF62010,   /* not an open session: never made, or cleared */
+  kvsimErrInvalidObject = (int32_t)0xBFF62011,    /* not a system, device or interface of an open
+                                                     system */
+  kvsimErrTooManySessions = (int32_t)0xBFF62012,  /* 8192 sessions are open already */
+  kvsimErrTooManySystems = (int32_t)0xBFF62013,   /* 255 systems are open already */
+  kvsimErrUnknownInterface = (int32_t)0xBFF62020, /* no interface of that name */
+  kvsimErrInvalidMode = (int32_t)0xBFF62021,      /* session mode above 12 */
+  kvsimErrInvalidList = (int32_t)0xBFF62022,      /* the list has an empty item */
+  kvsimErrWrongMode = (int32_t)0xBFF62023,        /* the call does not fit the session's mode */
+  kvsimErrPropertyUnknown = (int32_t)0xBFF62030,  /* the object has no such property, or no value */
+  kvsimErrPropertyReadOnly = (int32_t)0xBFF62031, /* the property cannot be set */
+  kvsimErrPropertySize = (int32_t)0xBFF62032,     /* the size does not fit the property's type */
+  kvsimErrBufferTooSmall = (int32_t)0xBFF62033,   /* a buffer cannot hold the data */
+  kvsimErrInvalidSubIndex = (int32_t)0xBFF62034,  /* sub-property index outside the session list */
+  kvsimErrTimeout = (int32_t)0xBFF62040,          /* the time limit ran out */
+  kvsimErrSessionCleared = (int32_t)0xBFF62041,  /* the session was cleared while the call waited */
+  kvsimErrInvalidCondition = (int32_t)0xBFF62042 /* kvWait does not know the condition */
+};
+
+/* The status that the call log shows for a call that is still inside the driver. */
+#define KVSIM_STATUS_PENDING ((int32_t)0x7FFFFFFF)
+
+/* ==== Conditions of kvWait =================================================================== */
+
+/* kvWait(session, condition, parameter, &out, timeLimit) returns 0 as soon as the condition is
+ * raised on the session (kvsimRaiseCondition), with the raised value in *out; the parameter is
+ * not used. A raised condition stays raised until lowered, so any number of waits return at once.
+ * The time limit is in seconds, negative for none; a wait that runs out returns kvsimErrTimeout.
+ * A clear of the session makes the wait return kvsimErrSessionCleared. */
+enum kvsimCondition {
+  kvsimConditionTransmitComplete = 0x8001,
+  kvsimConditionIntfCommunicating = 0x8002,
+  kvsimConditionIntfRemoteWakeup = 0x8003
+};
+
+/* ==== Reset ================================================================================== */
+
+/* Back to the state of a freshly loaded driver: clears every session (calls blocked on one
+ * return kvsimErrSessionCleared), closes every system, lifts every hold (held calls that wait on
+ * no session go on), drops injected failures, the call log, the signal values and the raised
+ * conditions, and sets the clock to 0. Handle generations keep counting, so a handle of before
+ * the reset stays invalid. */
+KVSIM_API void kvsimReset(void);
+
+/* ==== Injected failures ====================================================================== */
+
+/* The next `count` calls of the driver function `function` (count < 0: every call until
+ * kvsimClearFailures or kvsimReset) return `status`. A negative status replaces the call: it does
+ * nothing and its outputs are untouched. A positive status is a warning: the call does its work
+ * and returns the warning instead of 0 (a failure stays a failure). A call that takes a property
+ * identifier is checked against kvsimFailProperty rules first. Returns 0, or -1 if `function` is
+ * not a driver function that returns a status or `count` is 0. */
+KVSIM_API int32_t kvsimFailCall(const char *function, int32_t status, int32_t count);
+
+/* As kvsimFailCall, but only for calls of `function` with the property identifier `propertyId`.
+ * `function` is one of kvGetPropertySize, kvGetProperty, kvSetProperty, kvGetSubProperty and
+ * kvSetSubProperty; any other gives -1. */
+KVSIM_API int32_t kvsimFailProperty(const char *function, uint32_t propertyId, int32_t status,
+                                    int32_t count);
+
+/* Drops every injected failure. */
+KVSIM_API void kvsimClearFailures(void);
+
+/* ==== Call log =============================================================================== */
+
+/* One driver call. The meaning of the fields follows the function:
+ *
+ *   function                 object                     propertyId  size1          size2
+ *   kvCreateSession          handle made (0 if failed)  0           mode           0
+ *   kvhdnCreateErrorSession  handle made (0 if failed)  0           the status     0
+ *   kvClear                  session                    0           0              0
+ *   kvWait                   session                    condition   parameter      0
+ *   kvStatusToString         the status                 0           size           0
+ *   kvSystemOpen             handle made (0 if failed)  0           0              0
+ *   kvSystemClose            system                     0           0              0
+ *   kvGetPropertySize        object                     identifier  0              0
+ *   kvGetProperty            object                     identifier  size           0
+ *   kvSetProperty            object                     identifier  size           0
+ *   kvGetSubProperty         object                     identifier  size           index
+ *   kvSetSubProperty         object                     identifier  size           index
+ *   kvReadSignalSinglePoint  session                    0           values size    timestamps size
+ *   kvWriteSignalSinglePoint session                    0           values size    0
+ *
+ * `text` holds the interface name of kvCreateSession (cut to 63 bytes), and is empty otherwise.
+ * `status` is the result, or KVSIM_STATUS_PENDING while the call is inside the driver. */
+typedef struct kvsimCallRecord {
+  char function[32];
+  uint32_t object;
+  uint32_t propertyId;
+  uint32_t size1;
+  uint32_t size2;
+  int32_t status;
+  char text[64];
+} kvsimCallRecord;
+
+/* Number of calls in the log, in the order in which they entered the driver. The log keeps the
+ * latest 1048576 calls; older ones are dropped. */
+KVSIM_API int32_t kvsimLogCount(void);
+
+/* Copies call `index` (0 the oldest kept) into *entry. Returns 1, or 0 if there is no such call or
+ * `entry` is null. */
+KVSIM_API int32_t kvsimLogEntry(int32_t index, kvsimCallRecord *entry);
+
+/* Empties the log. Calls still inside the driver are not recorded again when they return. */
+KVSIM_API void kvsimLogClear(void);
+
+/* Number of logged calls of `function`. */
+KVSIM_API int32_t kvsimCountCalls(const char *function);
+
+/* Number of logged kvGetPropertySize, kvGetProperty and kvGetSubProperty calls for `propertyId`,
+ * on any object. */
+KVSIM_API int32_t kvsimCountPropertyReads(uint32_t propertyId);
+
+/* ==== Virtual clock ========================================================================== */
+
+/* The driver's time, in 100 ns units since 1601-01-01 00:00 UTC. It moves only when told; every
+ * timestamp that the driver gives comes from it. 0 after a reset. */
+KVSIM_API void kvsimSetClock(uint64_t rawTime);
+KVSIM_API void kvsimAdvanceClock(uint64_t delta);
+KVSIM_API uint64_t kvsimClock(void);
+
+/* ==== Held calls ============================================================================= */
+
+/* From now on every call of the driver function `function` parks inside the driver, after it has
+ * been logged and before anything else, until kvsimRelease. A parked call on a session returns
+ * kvsimErrSessionCleared if the session is cleared meanwhile. Returns 0, or -1 for a name that is
+ * not a driver function. */
+KVSIM_API int32_t kvsimHold(const char *function);
+
+/* Lifts the hold of `function`: its parked calls go on. Returns 0, or -1 as kvsimHold. */
+KVSIM_API int32_t kvsimRelease(const char *function);
+
+/* Waits until at least `count` calls of `function` are parked at once. Returns 1 when they are,
+ * 0 after a safety limit of 10 seconds. */
+KVSIM_API int32_t kvsimWaitParked(const char *function, int32_t count);
+
+/* Waits until at least `count` calls of `function` are blocked inside the driver waiting for
+ * their event (kvWait for its condition), so that what the test does next happens during the
+ * wait. Returns 1 when they are, 0 after a safety limit of 10 seconds. */
+KVSIM_API int32_t kvsimWaitBlocked(const char *function, int32_t count);
+
+/* ==== Signal values ========================================================================== */
+
+/* Puts the first `count` values (at most the session's number of signals) on the session's
+ * network as the latest values of the session's signals, in list order, with the clock's time as
+ * their timestamp. Every session on the same network whose list names a signal sees its value,
+ * as a value written by kvWriteSignalSinglePoint on that network is seen. Signals are matched
+ * by their name in the list. Returns the number of values set, or -1 if `session` is not an open
+ * session (error sessions included) or `values` is null while `count` is positive. */
+KVSIM_API int32_t kvsimSetSignalValues(uint32_t session, const double *values, int32_t count);
+
+/* Copies the latest values of the session's signals, in list order, into `values` (at most
+ * `max`; a signal never set reads 0.0). Returns the session's number of signals, or -1 as
+ * kvsimSetSignalValues. */
+KVSIM_API int32_t kvsimGetSignalValues(uint32_t session, double *values, int32_t max);
+
+/* ==== Wait conditions ======================================================================== */
+
+/* Raises `condition` (an enum kvsimCondition) on the session with `value` for kvWait's output,
+ * waking every kvWait for it. Returns 0, or -1 for a session that is not open or an unknown
+ * condition. */
+KVSIM_API int32_t kvsimRaiseCondition(uint32_t session, uint32_t condition, uint32_t value);
+
+/* Lowers `condition` on the session: later waits for it block again. Returns 0 or -1. */
+KVSIM_API int32_t kvsimLowerCondition(uint32_t session, uint32_t condition);
+
+/* ==== Counts ================================================================================= */
+
+/* Number of open sessions, error sessions included. */
+KVSIM_API int32_t kvsimOpenSessionCount(void);
+
+/* Number of open systems. */
+KVSIM_API int32_t kvsimOpenSystemCount(void);
+
+#ifdef __cplusplus
+}
+#endif
+
+#endif

@@ -1,0 +1,129 @@
+// Held calls: while a driver function is held its calls park inside the driver, until the test
+// releases them or their session is cleared.
+#include <chrono>
+#include <future>
+#include <vector>
+
+#include "kvor_test_support.h"
+
+namespace {
+
+using KvorHeldCalls = KvorTest;
+
+struct ReadResult {
+  int32_t status;
+  double value;
+};
+
+std::future<ReadResult> ReadAsync(uint32_t session) {
+  return std::async(std::launch::async, [=] {
+    double value = -1.0;
+    const int32_t status = kvReadSignalSinglePoint(session, &value, 8, nullptr, 0);
+    return ReadResult{status, value};
+  });
+}
+
+TEST_F(KvorHeldCalls, HeldReadsParkUntilReleasedAndThenReadTheBusAsItIsThen) {
+  std::vector<uint32_t> sessions;
+  for (const char *name : {"CAN1", "CAN2", "CAN1"}) {
+    sessions.push_back(Create(name, kvMode_SignalInSinglePoint, "Speed"));
+  }
+  ASSERT_EQ(kvsimHold("kvReadSignalSinglePoint"), 0);
+  std::vector<std::future<ReadResult>> reads;
+  for (uint32_t session : sessions) reads.push_back(ReadAsync(session));
+  ASSERT_EQ(kvsimWaitParked("kvReadSignalSinglePoint", 3), 1);
+
+  const double speed = 42.0;
+  ASSERT_EQ(kvsimSetSignalValues(sessions[0], &speed, 1), 1);
+  ASSERT_EQ(kvsimRelease("kvReadSignalSinglePoint"), 0);
+  for (auto &read : reads) {
+    const ReadResult result = read.get();
+    EXPECT_EQ(result.status, 0);
+    EXPECT_EQ(result.value, 42.0) << "the read ran after the release";
+  }
+  double value = 0;
+  EXPECT_EQ(kvReadSignalSinglePoint(sessions[0], &value, 8, nullptr, 0), 0)
+      << "a released function no longer parks";
+}
+
+TEST_F(KvorHeldCalls, ClearingTheSessionEndsItsParkedCallOnly) {
+  const uint32_t cleared = Create("CAN1", kvMode_SignalInSinglePoint, "A");
+  const uint32_t kept = Create("CAN1", kvMode_SignalInSinglePoint, "A");
+  ASSERT_EQ(kvsimHold("kvReadSignalSinglePoint"), 0);
+  auto first = ReadAsync(cleared);
+  auto second = ReadAsync(kept);
+  ASSERT_EQ(kvsimWaitParked("kvReadSignalSinglePoint", 2), 1);
+  ASSERT_EQ(kvClear(cleared), 0);
+  const ReadResult result = first.get();
+  EXPECT_EQ(result.status, kvsimErrSessionCleared);
+  EXPECT_EQ(result.value, -1.0);
+  EXPECT_EQ(second.wait_for(std::chrono::seconds(0)), std::future_status::timeout)
+      << "the other call is still parked";
+  ASSERT_EQ(kvsimRelease("kvReadSignalSinglePoint"), 0);
+  EXPECT_EQ(second.get().status, 0);
+}
+
+TEST_F(KvorHeldCalls, AParkedCallIsPendingInTheLogAndMeetsItsInjectedFailureWhenReleased) {
+  const uint32_t session = Create("CAN1", kvMode_SignalInSinglePoint, "A");
+  kvsimLogClear();
+  ASSERT_EQ(kvsimHold("kvReadSignalSinglePoint"), 0);
+  ASSERT_EQ(kvsimFailCall("kvReadSignalSinglePoint", kvsimErrTimeout, 1), 0);
+  auto read = ReadAsync(session);
+  ASSERT_EQ(kvsimWaitParked("kvReadSignalSinglePoint", 1), 1);
+  kvsimCallRecord record;
+  ASSERT_EQ(kvsimLogEntry(0, &record), 1);
+  EXPECT_STREQ(record.function, "kvReadSignalSinglePoint");
+  EXPECT_EQ(record.status, KVSIM_STATUS_PENDING);
+  ASSERT_EQ(kvsimRelease("kvReadSignalSinglePoint"), 0);
+  EXPECT_EQ(read.get().status, kvsimErrTimeout);
+  ASSERT_EQ(kvsimLogEntry(0, &record), 1);
+  EXPECT_EQ(record.status, kvsimErrTimeout);
+}
+
+TEST_F(KvorHeldCalls, ACallOnNoSessionParksUntilReleasedOrReset) {
+  for (bool byReset : {false, true}) {
+    ASSERT_EQ(kvsimHold("kvSystemOpen"), 0);
+    auto open = std::async(std::launch::async, [] {
+      uint32_t system = 0;
+      return kvSystemOpen(&system);
+    });
+    ASSERT_EQ(kvsimWaitParked("kvSystemOpen", 1), 1);
+    EXPECT_EQ(kvsimOpenSystemCount(), 0) << "parked before doing anything";
+    if (byReset) {
+      kvsimReset();
+    } else {
+      ASSERT_EQ(kvsimRelease("kvSystemOpen"), 0);
+    }
+    EXPECT_EQ(open.get(), 0);
+    EXPECT_EQ(kvsimOpenSystemCount(), 1);
+    kvsimReset();
+  }
+}
+
+TEST_F(KvorHeldCalls, AHeldWaitParksBeforeItWaits) {
+  const uint32_t session = Create("CAN2", kvMode_FrameInStream);
+  ASSERT_EQ(kvsimRaiseCondition(session, kvsimConditionIntfCommunicating, 3), 0);
+  ASSERT_EQ(kvsimHold("kvWait"), 0);
+  auto wait = std::async(std::launch::async, [=] {
+    uint32_t value = 0;
+    return kvWait(session, kvsimConditionIntfCommunicating, 0, &value, -1.0);
+  });
+  ASSERT_EQ(kvsimWaitParked("kvWait", 1), 1);
+  EXPECT_EQ(wait.wait_for(std::chrono::seconds(0)), std::future_status::timeout)
+      << "a raised condition does not free a parked call";
+  ASSERT_EQ(kvsimRelease("kvWait"), 0);
+  EXPECT_EQ(wait.get(), 0);
+}
+
+TEST_F(KvorHeldCalls, OnlyDriverFunctionsCanBeHeld) {
+  EXPECT_EQ(kvsimHold("kvReadFrame"), -1) << "not a function of this driver";
+  EXPECT_EQ(kvsimHold(nullptr), -1);
+  EXPECT_EQ(kvsimRelease("kvsimReset"), -1);
+  EXPECT_EQ(kvsimHold("kvStatusToString"), 0);
+  EXPECT_EQ(kvsimRelease("kvStatusToString"), 0);
+  char text[32];
+  kvStatusToString(0, sizeof text, text);
+  EXPECT_EQ(kvsimCountCalls("kvStatusToString"), 1) << "a released hold lets calls through";
+}
+
+}  // namespace

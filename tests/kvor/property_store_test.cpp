@@ -1,0 +1,183 @@
+// Session properties: any identifier stores the bytes set and gives them back, with the size
+// rules of a driver; the definition's own properties cannot be set.
+#include <cstring>
+#include <vector>
+
+#include "kvor_test_support.h"
+
+namespace {
+
+using KvorSessionProperties = KvorTest;
+
+std::vector<uint8_t> Bytes(std::initializer_list<uint8_t> bytes) { return bytes; }
+
+TEST_F(KvorSessionProperties, ValuesOfEveryTypeComeBackAsSet) {
+  const uint32_t session = Create("CAN1", kvMode_FrameOutQueued, "F1,F2");
+  const struct {
+    uint32_t id;
+    std::vector<uint8_t> value;
+  } cases[] = {
+      {kvPropSession_IntfBaudRate, Bytes({0x20, 0xA1, 0x07, 0x00})},
+      {kvPropSession_ResampRate, Bytes({1, 2, 3, 4, 5, 6, 7, 8})},
+      {kvPropSession_AutoStart, Bytes({1})},
+      {kvPropSession_IntfEnetMacAddress, Bytes({'0', '2', ':', 'A', 'F', 0})},
+      {kvPropSession_IntfLINSchedNames, Bytes({'S', '1', ',', 'S', '2', 0})},
+      {kvPropSession_J1939ECU, Bytes({0x11, 0x22, 0x33, 0x44})},
+      {kvPropSession_IntfBaudRate64, Bytes({8, 7, 6, 5, 4, 3, 2, 1})},
+      {kvPropSession_IntfCANOutStrmListById, Bytes({1, 0, 0, 0, 2, 0, 0, 0, 3, 0})},
+      {kvPropSession_IntfEnetEptReceiveFilter, Bytes({9, 8, 7})},
+      {kvPropHidden_ByteArrayBits, Bytes({0x40, 0, 0, 0})},
+      {0x7F10ABCDu, Bytes({0xCA, 0xFE, 0xBA, 0xBE, 0x99})},
+      {kvPropSession_IntfOutStrmList, Bytes({})},
+  };
+  for (const auto &c : cases) {
+    ASSERT_EQ(kvSetProperty(session, c.id, static_cast<uint32_t>(c.value.size()), c.value.data()),
+              0)
+        << std::hex << c.id;
+  }
+  for (const auto &c : cases) {
+    uint32_t size = 0xFFFF;
+    ASSERT_EQ(kvGetPropertySize(session, c.id, &size), 0) << std::hex << c.id;
+    EXPECT_EQ(size, c.value.size()) << std::hex << c.id;
+    std::vector<uint8_t> read(c.value.size() + 4, 0xEE);
+    ASSERT_EQ(kvGetProperty(session, c.id, static_cast<uint32_t>(read.size()), read.data()), 0)
+        << std::hex << c.id;
+    EXPECT_TRUE(std::equal(c.value.begin(), c.value.end(), read.begin())) << std::hex << c.id;
+    EXPECT_EQ(read[c.value.size()], 0xEE) << "nothing written past the value " << std::hex << c.id;
+  }
+}
+
+TEST_F(KvorSessionProperties, TextSetWithoutItsNulIsStoredWithOne) {
+  const uint32_t session = Create("ENET1", kvMode_FrameInStream);
+  ASSERT_EQ(kvSetProperty(session, kvPropSession_EnetLogFile, 7, "cap.log"), 0);
+  EXPECT_EQ(ReadText(session, kvPropSession_EnetLogFile), "cap.log");
+  uint32_t size = 0;
+  ASSERT_EQ(kvGetPropertySize(session, kvPropSession_EnetLogFile, &size), 0);
+  EXPECT_EQ(size, 8u);
+}
+
+TEST_F(KvorSessionProperties, ALaterSetReplacesTheValueWhateverItsSize) {
+  const uint32_t session = Create("ENET1", kvMode_FrameInStream);
+  ASSERT_EQ(kvSetProperty(session, kvPropSession_EnetLogFile, 15, "first-name.log"), 0);
+  ASSERT_EQ(kvSetProperty(session, kvPropSession_EnetLogFile, 3, "b2"), 0);
+  EXPECT_EQ(ReadText(session, kvPropSession_EnetLogFile), "b2");
+}
+
+TEST_F(KvorSessionProperties, ASmallBufferIsRefusedAndLeftUntouched) {
+  const uint32_t session = Create("CAN1", kvMode_SignalInSinglePoint, "Alpha,Beta");
+  const uint32_t baud = 500000;
+  ASSERT_EQ(kvSetProperty(session, kvPropSession_IntfBaudRate, 4, &baud), 0);
+  const struct {
+    uint32_t id;
+    uint32_t needed;
+  } cases[] = {
+      {kvPropSession_IntfBaudRate, 4},
+      {kvPropSession_Mode, 4},
+      {kvPropSession_List, sizeof "Alpha,Beta"},
+      {kvPropSession_IntfName, sizeof "CAN1"},
+  };
+  for (const auto &c : cases) {
+    std::vector<uint8_t> buffer(c.needed, 0xEE);
+    EXPECT_EQ(kvGetProperty(session, c.id, c.needed - 1, buffer.data()), kvsimErrBufferTooSmall)
+        << std::hex << c.id;
+    EXPECT_EQ(buffer, std::vector<uint8_t>(c.needed, 0xEE)) << std::hex << c.id;
+    EXPECT_EQ(kvGetProperty(session, c.id, 0, nullptr), kvsimErrBufferTooSmall) << std::hex << c.id;
+    EXPECT_EQ(kvGetProperty(session, c.id, c.needed, buffer.data()), 0) << std::hex << c.id;
+  }
+}
+
+TEST_F(KvorSessionProperties, FixedSizeTypesTakeExactlyTheirSize) {
+  const uint32_t session = Create("CAN1", kvMode_FrameOutQueued, "F1");
+  const uint8_t bytes[16] = {};
+  const struct {
+    uint32_t id;
+    uint32_t size;
+  } wrong[] = {
+      {kvPropSession_IntfBaudRate, 2},   {kvPropSession_IntfBaudRate, 8},
+      {kvPropSession_ResampRate, 4},     {kvPropSession_AutoStart, 4},
+      {kvPropSession_IntfBaudRate64, 4}, {kvPropSession_J1939ECU, 0},
+  };
+  for (const auto &w : wrong) {
+    EXPECT_EQ(kvSetProperty(session, w.id, w.size, bytes), kvsimErrPropertySize)
+        << std::hex << w.id << " size " << std::dec << w.size;
+    uint32_t size = 0;
+    EXPECT_EQ(kvGetPropertySize(session, w.id, &size), kvsimErrPropertyUnknown)
+        << "a refused value is not stored";
+  }
+}
+
+TEST_F(KvorSessionProperties, APropertyNeverSetIsUnknown) {
+  const uint32_t session = Create("LIN1", kvMode_FrameInStream);
+  uint32_t size = 0;
+  uint32_t value = 0;
+  EXPECT_EQ(kvGetPropertySize(session, kvPropSession_IntfLINMaster, &size),
+            kvsimErrPropertyUnknown);
+  EXPECT_EQ(kvGetProperty(session, kvPropSession_IntfLINMaster, 4, &value),
+            kvsimErrPropertyUnknown);
+}
+
+TEST_F(KvorSessionProperties, TheDefinitionCannotBeChanged) {
+  const uint32_t session = Create("CAN2", kvMode_SignalInSinglePoint, "A,B");
+  const uint32_t four = 4;
+  for (uint32_t id : {kvPropSession_Mode, kvPropSession_NumInList, kvPropSession_Protocol}) {
+    EXPECT_EQ(kvSetProperty(session, id, 4, &four), kvsimErrPropertyReadOnly) << std::hex << id;
+  }
+  for (uint32_t id : {kvPropSession_List, kvPropSession_IntfName, kvPropSession_DatabaseName,
+                      kvPropSession_ClusterName}) {
+    EXPECT_EQ(kvSetProperty(session, id, 2, "X"), kvsimErrPropertyReadOnly) << std::hex << id;
+  }
+  EXPECT_EQ(ReadU32(session, kvPropSession_Mode), 0u);
+  EXPECT_EQ(ReadU32(session, kvPropSession_NumInList), 2u);
+  EXPECT_EQ(ReadText(session, kvPropSession_List), "A,B");
+  EXPECT_EQ(ReadText(session, kvPropSession_IntfName), "CAN2");
+}
+
+TEST_F(KvorSessionProperties, NullPointersAreRefused) {
+  const uint32_t session = Create("CAN2", kvMode_SignalInSinglePoint, "A");
+  EXPECT_EQ(kvGetPropertySize(session, kvPropSession_Mode, nullptr), kvsimErrNullPointer);
+  EXPECT_EQ(kvGetProperty(session, kvPropSession_Mode, 4, nullptr), kvsimErrNullPointer);
+  EXPECT_EQ(kvSetProperty(session, kvPropSession_IntfBaudRate, 4, nullptr), kvsimErrNullPointer);
+  EXPECT_EQ(kvSetSubProperty(session, 0, kvPropSessionSub_CANTxTime, 8, nullptr),
+            kvsimErrNullPointer);
+}
+
+TEST_F(KvorSessionProperties, SessionsKeepTheirOwnValues) {
+  const uint32_t first = Create("CAN1", kvMode_FrameInStream);
+  const uint32_t second = Create("CAN1", kvMode_FrameInStream);
+  const uint32_t a = 125000, b = 250000;
+  ASSERT_EQ(kvSetProperty(first, kvPropSession_IntfBaudRate, 4, &a), 0);
+  uint32_t size = 0;
+  EXPECT_EQ(kvGetPropertySize(second, kvPropSession_IntfBaudRate, &size), kvsimErrPropertyUnknown);
+  ASSERT_EQ(kvSetProperty(second, kvPropSession_IntfBaudRate, 4, &b), 0);
+  EXPECT_EQ(ReadU32(first, kvPropSession_IntfBaudRate), a);
+  EXPECT_EQ(ReadU32(second, kvPropSession_IntfBaudRate), b);
+}
+
+TEST_F(KvorSessionProperties, SubPropertiesBelongToOneItemOfTheList) {
+  const uint32_t session = Create("CAN1", kvMode_FrameOutQueued, "F1,F2,F3");
+  const double times[] = {0.010, 0.020, 0.030};
+  for (uint32_t index = 0; index < 3; ++index) {
+    ASSERT_EQ(kvSetSubProperty(session, index, kvPropSessionSub_CANTxTime, 8, &times[index]), 0);
+  }
+  for (uint32_t index = 0; index < 3; ++index) {
+    double read = -1;
+    ASSERT_EQ(kvGetSubProperty(session, index, kvPropSessionSub_CANTxTime, 8, &read), 0);
+    EXPECT_EQ(read, times[index]) << index;
+    EXPECT_EQ(kvGetSubProperty(session, index, kvPropSessionSub_CANTxTime, 7, &read),
+              kvsimErrBufferTooSmall);
+  }
+  uint32_t size = 0;
+  EXPECT_EQ(kvGetPropertySize(session, kvPropSessionSub_CANTxTime, &size), kvsimErrPropertyUnknown)
+      << "a per-item value is not the session's plain value";
+  double read = 0;
+  EXPECT_EQ(kvGetSubProperty(session, 0, kvPropSessionSub_SkipNCyclicFrames, 4, &read),
+            kvsimErrPropertyUnknown);
+  EXPECT_EQ(kvGetSubProperty(session, 3, kvPropSessionSub_CANTxTime, 8, &read),
+            kvsimErrInvalidSubIndex);
+  EXPECT_EQ(kvSetSubProperty(session, 3, kvPropSessionSub_CANTxTime, 8, &times[0]),
+            kvsimErrInvalidSubIndex);
+  EXPECT_EQ(kvSetSubProperty(session, 1, kvPropSessionSub_CANTxTime, 4, &times[0]),
+            kvsimErrPropertySize);
+}
+
+}  // namespace
