@@ -31,6 +31,10 @@ void SetErrorLogProvider(tErrorLogInit init, tErrorLogGet get);
 // The log object that reports are written to, or null.
 iErrorLog *GetErrorLog();
 
+// Forgets that the log was built, so that the next report runs the installed builder again. For a
+// provider swapped in after reports have been made (tests install a fake log this way).
+void ResetErrorLogInit();
+
 // Always returns 0xBFF63001. Safe from any thread, with or without any lock of the library held.
 Status ReportInternalError(uint32_t component, uint32_t file, uint32_t line, uint32_t info);
 

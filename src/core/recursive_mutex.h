@@ -5,11 +5,13 @@
 #include <pthread.h>
 
 #include <boost/noncopyable.hpp>
+#include <mutex>
 
 #include "core/status_block.h"
 
 namespace nKVSVAPI100 {
 
+// Locked through std::lock_guard, which this header brings along for its users.
 class cRecursiveMutex : boost::noncopyable {
  public:
   // A mutex that cannot be made leaves -52003 in `owner` (this header's path, line of the
