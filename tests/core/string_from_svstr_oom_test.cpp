@@ -26,8 +26,13 @@ void *operator new(std::size_t size) {
   throw std::bad_alloc();
 }
 
+// This program's operator new takes its memory from malloc, so free is the matching release; the
+// compiler cannot see that through the replacement.
+#pragma GCC diagnostic push
+#pragma GCC diagnostic ignored "-Wmismatched-new-delete"
 void operator delete(void *memory) noexcept { std::free(memory); }
 void operator delete(void *memory, std::size_t) noexcept { std::free(memory); }
+#pragma GCC diagnostic pop
 
 namespace {
 

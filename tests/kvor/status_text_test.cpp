@@ -44,12 +44,17 @@ TEST_F(KvorStatusText, AnyOtherStatusIsNamedByItsNumber) {
     int32_t status;
     const char *text;
   } cases[] = {
-      {static_cast<int32_t>(0xBFF63020), "Unknown error (status 0xBFF63020)."},
+      {static_cast<int32_t>(0xBFF63FFF), "Unknown error (status 0xBFF63FFF)."},
       {static_cast<int32_t>(0xBFF62FFF), "Unknown error (status 0xBFF62FFF)."},
       {-1, "Unknown error (status 0xFFFFFFFF)."},
       {0x3FF62001, "Unknown warning (status 0x3FF62001)."},
   };
   for (const auto &c : cases) EXPECT_EQ(TextOf(c.status), c.text);
+}
+
+TEST_F(KvorStatusText, TheBindingsStatusesHaveTexts) {
+  EXPECT_EQ(TextOf(static_cast<int32_t>(0xBFF63020)), "The session reference is invalid.");
+  EXPECT_EQ(TextOf(static_cast<int32_t>(0xBFF630B0)), "The output array could not be allocated.");
 }
 
 TEST_F(KvorStatusText, TheTextIsCutToTheSizeAndAlwaysTerminated) {
