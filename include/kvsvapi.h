@@ -84,7 +84,8 @@ KVSV_EXPORT void kvsvStatusToString(int32_t status, uint32_t size, char *text);
 
 /* ---- Time conversions ---------------------------------------------------------------------
  * rawTime: 100 ns since 1601-01-01 (values up to 118653335999999999 are relative times);
- * 1 ns time: ns since 1970-01-01. Zero means "no time" and converts to zero both ways. */
+ * 1 ns time: ns since 1970-01-01. Zero means "no time" and converts to zero both ways.
+ * A null result pointer is ignored; a null SvTime reads as zero. */
 
 KVSV_EXPORT void kvsvRawTimeToSvTime(SvTime *result, uint64_t value);
 KVSV_EXPORT void kvsvSvTimeToRawTime(uint64_t *result, const SvTime *value);
@@ -103,7 +104,8 @@ KVSV_EXPORT int32_t kvsvGetIsProjectSessionOpen(void);
 /* Reads the latest value of every signal of `session` into the host double array `*values`
  * (count at byte 0, values from byte 8), creating or growing the handle as needed.
  * 0xBFF63020: no such session. 0xBFF63027: the session is in use by another call or closing.
- * 0xBFF630B0: the host could not grow the array. After any failure the array's count is 0. */
+ * 0xBFF630B0: the host could not grow the array. 0xBFF63015: `values` is null.
+ * After a failure past the session checks the array's count is 0. */
 KVSV_EXPORT kvsvStatus kvsvReadSignalSinglePoint(uint32_t session, SvHandle *values);
 
 /* Writes one value per signal of `session` from the host double array `values`. */

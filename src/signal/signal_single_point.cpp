@@ -8,6 +8,7 @@
 using namespace nKVSVAPI100;
 
 extern "C" KVSV_EXPORT kvsvStatus kvsvReadSignalSinglePoint(uint32_t session, SvHandle *values) {
+  if (values == nullptr) return kvErrNullArgument;
   cSlotGuard guard(session);
   if (!guard) return guard.status();
   tSessionSlot &slot = guard.slot();

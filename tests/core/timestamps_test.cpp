@@ -222,4 +222,17 @@ TEST(NsTime, SvTimeComesBackWithinHalfANanosecond) {
   }
 }
 
+TEST(TimeExports, NullPointersAreIgnoredOrReadAsNoTime) {
+  kvsvRawTimeToSvTime(nullptr, 123);
+  kvsv1nsTimeToSvTime(nullptr, 123);
+  kvsvSvTimeToRawTime(nullptr, nullptr);
+  kvsvSvTimeTo1nsTime(nullptr, nullptr);
+  uint64_t raw = 77;
+  kvsvSvTimeToRawTime(&raw, nullptr);
+  EXPECT_EQ(raw, 0u);
+  uint64_t ns = 77;
+  kvsvSvTimeTo1nsTime(&ns, nullptr);
+  EXPECT_EQ(ns, 0u);
+}
+
 }  // namespace

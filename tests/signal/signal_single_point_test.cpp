@@ -218,6 +218,13 @@ TEST_F(SignalSinglePoint, EntryFailuresLeaveTheArrayAndTheDriverAlone) {
   }
 }
 
+TEST_F(SignalSinglePoint, NullArrayPointerIsRefusedBeforeTheSession) {
+  kvsimLogClear();
+  EXPECT_EQ(kvsvReadSignalSinglePoint(session_, nullptr), kvErrNullArgument);
+  EXPECT_EQ(kvsimLogCount(), 0);
+  EXPECT_EQ(Slot(session_)->guard.load(), 0u);
+}
+
 TEST_F(SignalSinglePoint, OnlyTheLowSixteenBitsChooseTheSlot) {
   // Other high bits reach the same slot; the driver, given that handle, judges it.
   const uint32_t alias = session_ ^ 0x00FF0000u;
