@@ -96,8 +96,75 @@ KVSV_EXPORT void kvsvSvTimeTo1nsTime(uint64_t *result, const SvTime *value);
 
 /* ---- Sessions ------------------------------------------------------------------------------ */
 
+/* Cookie of a reference registered with the host. */
+typedef uint64_t kvsvRefnum;
+
 /* Non-zero while a project session is open (manual sessions do not count). */
 KVSV_EXPORT int32_t kvsvGetIsProjectSessionOpen(void);
+
+/* Creates a session in the driver from its definition and registers it with the host as
+ * "___kvorSesn#" plus its handle in eight hex digits; the reference goes to *reference. A session
+ * the driver refuses is registered all the same (handle 0) and its status returned. */
+KVSV_EXPORT kvsvStatus kvsvSessionManualCreate(const char *database, const char *cluster,
+                                               const char *list, const char *interfaceName,
+                                               uint32_t mode, kvsvRefnum *reference);
+
+/* The host's close of a session reference (any reference is accepted and sent to the close of its
+ * class). Clears the session in the driver, waits for calls that use it, frees its slot. 0. */
+KVSV_EXPORT kvsvStatus kvsvSessionClose(uint32_t session);
+
+/* Removes the host reference, then closes the session as kvsvSessionClose does. Returns the
+ * outcome of the removal (a host warning is dropped). */
+KVSV_EXPORT kvsvStatus kvsvSessionClear(uint32_t session, kvsvRefnum reference);
+
+/* The clean-up that blocking calls register with the host: closes the session without any lock,
+ * even while a call is blocked on it, and frees the call's guard. Always 0. */
+KVSV_EXPORT kvsvStatus kvsvSessionAbort(uint64_t session);
+
+/* Waits in the driver for `condition`; a time limit other than 0.0 first registers
+ * kvsvSessionAbort as the program's clean-up. The driver's status. */
+KVSV_EXPORT kvsvStatus kvsvSessionWait(uint32_t session, uint32_t condition, uint32_t parameter,
+                                       uint32_t *parameterOut, double timeLimit);
+
+/* Forwards to the driver, arguments unchanged, returning its status. */
+KVSV_EXPORT kvsvStatus kvsvSessionStart(uint32_t session, uint32_t scope);
+KVSV_EXPORT kvsvStatus kvsvSessionStop(uint32_t session, uint32_t scope);
+KVSV_EXPORT kvsvStatus kvsvSessionFlush(uint32_t session);
+KVSV_EXPORT kvsvStatus kvsvSessionConnectTerminals(uint32_t session, const char *source,
+                                                   const char *destination);
+KVSV_EXPORT kvsvStatus kvsvSessionDisconnectTerminals(uint32_t session, const char *source,
+                                                      const char *destination);
+KVSV_EXPORT kvsvStatus kvsvSessionCreateSvTiming_FlexRayMacrotick(uint32_t session,
+                                                                  uint64_t *timingSource);
+KVSV_EXPORT kvsvStatus kvsvInterfaceBlink(uint32_t interfaceRef, uint32_t mode);
+
+/* ---- System, devices, interfaces ----------------------------------------------------------- */
+
+/* Opens the driver's system (counted); *system gets its handle, or an error handle standing for
+ * a failed open. `name` is not read. Always 0. */
+KVSV_EXPORT kvsvStatus kvsvSystemOpen(SvHandle *name, uint32_t *system);
+
+/* Releases a system reference; the last one closes the driver's system. Other classes go to the
+ * close of their class. 0. */
+KVSV_EXPORT kvsvStatus kvsvSystemClose(uint32_t system);
+
+/* Closes the system whatever its count, removing every device and interface reference. Both
+ * outputs are set to 0. The driver's status. */
+KVSV_EXPORT kvsvStatus kvsvSystemManualClose(uint64_t *reserved1, uint64_t *reserved2);
+
+/* Number of system references out. */
+KVSV_EXPORT uint32_t kvsvGetSystemRefCount(void);
+
+/* Opens the device named by the string handle *name ("___kvorDev#" plus the complement of its
+ * serial number in eight hex digits). An unknown name gives status 0 and an error handle whose
+ * first use fails. 0xBFF630A5: empty name; 0xBFF63001: null output. */
+KVSV_EXPORT kvsvStatus kvsvDeviceOpen(SvHandle *name, uint32_t *device);
+KVSV_EXPORT kvsvStatus kvsvDeviceClose(uint32_t device);
+
+/* Opens the interface named by *name (case does not matter; an Ethernet interface also answers to
+ * its name plus "/monitor"). Unknown names as for devices; 0xBFF6308A: empty name. */
+KVSV_EXPORT kvsvStatus kvsvInterfaceOpen(SvHandle *name, uint32_t *interfaceRef);
+KVSV_EXPORT kvsvStatus kvsvInterfaceClose(uint32_t interfaceRef);
 
 /* ---- Signals ------------------------------------------------------------------------------- */
 

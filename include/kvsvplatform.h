@@ -100,6 +100,18 @@ int32_t kvhdnCreateErrorSession(int32_t status, uint32_t *session);
 int32_t kvWait(uint32_t session, uint32_t condition, uint32_t parameter, uint32_t *parameterOut,
                double timeout);
 
+/* Session control. */
+int32_t kvStart(uint32_t session, uint32_t scope);
+int32_t kvStop(uint32_t session, uint32_t scope);
+int32_t kvFlush(uint32_t session);
+int32_t kvConnectTerminals(uint32_t session, const char *source, const char *destination);
+int32_t kvDisconnectTerminals(uint32_t session, const char *source, const char *destination);
+int32_t kvhdnCreateSvTiming_FlexRayMacrotick(uint32_t session, uint64_t *timingSource);
+int32_t kvBlink(uint32_t interfaceRef, uint32_t mode);
+
+/* Databases. */
+int32_t kvdbCloseDatabase(uint32_t database, uint32_t closeAll);
+
 /* Status text. */
 void kvStatusToString(int32_t status, uint32_t size, char *text);
 

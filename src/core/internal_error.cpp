@@ -1,9 +1,9 @@
 #include "core/internal_error.h"
 
 #include <atomic>
-#include <cerrno>
 #include <cstdlib>
-#include <ctime>
+
+#include "core/sleep.h"
 
 namespace nKVSVAPI100 {
 
@@ -27,13 +27,6 @@ constexpr uint64_t kLogInitLine = 166;
 // Statuses of the reports are shown in the family of this library, by their top bits only.
 constexpr uint32_t kReportBase = 0x3FF63000;
 constexpr uint32_t kReportMask = 0x7FFFC000;
-
-void SleepMs(uint32_t ms) {
-  timespec wanted{static_cast<time_t>(ms / 1000),
-                  static_cast<long>((static_cast<uint64_t>(ms) * 1000000u) % 1000000000u)};
-  timespec remaining{};
-  while (nanosleep(&wanted, &remaining) != 0 && errno == EINTR) wanted = remaining;
-}
 
 void InitErrorLog(tStatusBlock &block) {
   try {

@@ -6,7 +6,9 @@
 #include <atomic>
 #include <cstdint>
 #include <memory>
+#include <mutex>
 #include <string>
+#include <vector>
 
 #include <boost/noncopyable.hpp>
 #include <boost/unordered_map.hpp>
@@ -30,9 +32,10 @@ class cSnLifeManager : boost::noncopyable {
   // Frees the records and the slots; driver sessions are left to the driver.
   ~cSnLifeManager();
 
+  // Built before the mutex, which records its failure here.
+  tStatusBlock status;  // negative code if the mutex could not be made
   // Serialises open, create, close, clear and every change of the map and the slot pointers.
   std::unique_ptr<cRecursiveMutex> mutex;
-  tStatusBlock status;  // negative code if the mutex could not be made
   boost::unordered_map<std::string, cSnLifeInterface *> interfaces;  // owned
   // Read without a lock by every guarded call; written under `mutex`.
   std::array<std::atomic<tSessionSlot *>, kMaxSlotIndex + 1> slots;
@@ -42,8 +45,16 @@ class cSnLifeManager : boost::noncopyable {
   void EraseInterface(const std::string &key);
   bool ProjectSessionOpen() const { return interfaceCount_.load() != 0; }
 
+  // A caller that loaded a slot pointer just before its teardown may still touch the record's
+  // guard, so records are never handed back to the allocator while the process runs: an ended
+  // slot is kept here, invalid, and the next new slot reuses it.
+  tSessionSlot *NewSlot();
+  void RetireSlot(tSessionSlot *slot);
+
  private:
   std::atomic<std::size_t> interfaceCount_{0};
+  std::mutex retiredMutex_;  // a leaf lock: nothing is called while it is held
+  std::vector<tSessionSlot *> retired_;
 };
 
 extern cSnLifeManager gSessionManager;

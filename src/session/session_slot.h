@@ -52,7 +52,12 @@ struct tSessionSlot {
   std::atomic<uint32_t> listGuard{0};  // held while a name list is looked up or built
 };
 
-// Frees what the slot owns, then the slot.
+// Frees what the slot owns and puts the record back to its initial values, invalid and with free
+// guards.
+void ClearSlot(tSessionSlot &slot);
+
+// Frees what the slot owns, then the record: back to the session manager, which keeps records for
+// reuse, or deleted when there is no manager (its end at process exit).
 void DestroySlot(tSessionSlot *slot);
 
 }  // namespace nKVSVAPI100

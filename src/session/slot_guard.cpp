@@ -16,8 +16,9 @@ cSlotGuard::cSlotGuard(uint32_t session, tGuardWord word) : word_(word) {
     status_ = kvErrSessionBusy;
     return;
   }
-  // Teardown clears slotValid before it waits for the guards: past this test the slot stays.
-  if (slot->slotValid.load() == 0) {
+  // Teardown clears slotValid before it waits for the guards: past this test the slot stays. A
+  // record ended and reused for another index between our load and our guard is not ours.
+  if (slot->slotValid.load() == 0 || gSessionManager.slots[index].load() != slot) {
     guard.exchange(0);
     status_ = kvErrSessionBusy;
     return;

@@ -7,7 +7,7 @@
 
 #include "core/exception_base.h"
 #include "core/exception_to_status.h"
-#include "core/fake_error_log.h"
+#include "support/fake_error_log.h"
 
 namespace {
 

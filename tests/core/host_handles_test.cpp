@@ -8,7 +8,7 @@
 #include <string>
 #include <vector>
 
-#include "core/fake_error_log.h"
+#include "support/fake_error_log.h"
 #include "svsim.h"
 
 namespace {

@@ -10,7 +10,7 @@
 #include <thread>
 #include <vector>
 
-#include "core/fake_error_log.h"
+#include "support/fake_error_log.h"
 #include "core/internal_error.h"
 
 namespace {

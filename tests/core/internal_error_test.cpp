@@ -4,7 +4,7 @@
 
 #include <gtest/gtest.h>
 
-#include "core/fake_error_log.h"
+#include "support/fake_error_log.h"
 
 namespace {
 

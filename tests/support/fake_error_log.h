@@ -1,7 +1,7 @@
 // A stand-in for the circular error log: it keeps what the reporter hands it, and its builder can
 // be told to fail, to throw or to wait.
-#ifndef KVSVAPI_TESTS_CORE_FAKE_ERROR_LOG_H
-#define KVSVAPI_TESTS_CORE_FAKE_ERROR_LOG_H
+#ifndef KVSVAPI_TESTS_FAKE_ERROR_LOG_H
+#define KVSVAPI_TESTS_FAKE_ERROR_LOG_H
 
 #include <cstdint>
 #include <functional>

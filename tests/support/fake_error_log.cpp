@@ -1,4 +1,4 @@
-#include "core/fake_error_log.h"
+#include "support/fake_error_log.h"
 
 #include <atomic>
 #include <stdexcept>
