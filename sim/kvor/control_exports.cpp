@@ -8,6 +8,7 @@
 
 #include "driver.h"
 #include "driver_functions.h"
+#include "inventory.h"
 #include "kvsim.h"
 #include "session_events.h"
 
@@ -27,6 +28,14 @@ std::shared_ptr<Session> ControlledSession(uint32_t handle) {
   std::shared_ptr<Session> session = Driver::Instance().Sessions().Find(handle);
   if (!session || session->ErrorStatus() != 0) return nullptr;
   return session;
+}
+
+// The inventory index of the interface of that name, if there is one.
+std::optional<uint32_t> NamedInterface(const char *interfaceName) {
+  if (interfaceName == nullptr) return std::nullopt;
+  const std::optional<InterfacePlace> place = FindInterface(interfaceName);
+  if (!place) return std::nullopt;
+  return place->index;
 }
 
 int32_t AddFailure(const char *function, std::optional<uint32_t> propertyId, int32_t status,
@@ -136,6 +145,35 @@ int32_t kvsimLowerCondition(uint32_t session, uint32_t condition) {
   if (!target || !IsWaitCondition(condition)) return -1;
   target->Events().Lower(condition);
   return 0;
+}
+
+int32_t kvsimSessionStarted(uint32_t session) {
+  if (!ControlledSession(session)) return -1;
+  return Driver::Instance().Running().SessionStarted(session) ? 1 : 0;
+}
+
+int32_t kvsimInterfaceStarted(const char *interfaceName) {
+  const std::optional<uint32_t> index = NamedInterface(interfaceName);
+  if (!index) return -1;
+  return Driver::Instance().Running().InterfaceStarted(*index) ? 1 : 0;
+}
+
+int32_t kvsimTerminalsConnected(uint32_t session, const char *source, const char *destination) {
+  const std::shared_ptr<Session> target = ControlledSession(session);
+  if (!target || source == nullptr || destination == nullptr) return -1;
+  return target->Terminals().IsConnected(source, destination) ? 1 : 0;
+}
+
+int32_t kvsimTerminalConnectionCount(uint32_t session) {
+  const std::shared_ptr<Session> target = ControlledSession(session);
+  if (!target) return -1;
+  return CountToInt(target->Terminals().Count());
+}
+
+int32_t kvsimBlinkMode(const char *interfaceName) {
+  const std::optional<uint32_t> index = NamedInterface(interfaceName);
+  if (!index) return -1;
+  return static_cast<int32_t>(Driver::Instance().Blinking().Get(*index));
 }
 
 int32_t kvsimOpenSessionCount(void) { return CountToInt(Driver::Instance().Sessions().Count()); }

@@ -17,10 +17,17 @@ Status Driver::UseSession(uint32_t handle, std::shared_ptr<Session> *session) {
   return (*session)->ErrorStatus();
 }
 
+Status Driver::ErrorSessionStatus(uint32_t handle) const {
+  const std::shared_ptr<Session> session = sessions_.Find(handle);
+  return session ? session->ErrorStatus() : 0;
+}
+
 Status Driver::ClearSession(uint32_t handle) {
   std::shared_ptr<Session> session = sessions_.Remove(handle);
   if (!session) return kvsimErrInvalidSession;
+  // Marked before the session stops, so that a start racing with the clear cannot outlive it.
   session->Events().MarkCleared();
+  running_.Forget(handle);
   holds_.Wake();
   return 0;
 }
@@ -30,6 +37,8 @@ void Driver::Reset() {
     session->Events().MarkCleared();
   }
   systems_.CloseAll();
+  running_.Reset();
+  blinking_.Reset();
   failures_.Clear();
   for (Network &network : networks_) network.Clear();
   clock_.Set(0);

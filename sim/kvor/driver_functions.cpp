@@ -19,6 +19,14 @@ constexpr DriverFunction kFunctions[] = {
     {"kvSetSubProperty", true, true},
     {"kvReadSignalSinglePoint", true, false},
     {"kvWriteSignalSinglePoint", true, false},
+    {"kvStart", true, false},
+    {"kvStop", true, false},
+    {"kvFlush", true, false},
+    {"kvConnectTerminals", true, false},
+    {"kvDisconnectTerminals", true, false},
+    {"kvhdnCreateSvTiming_FlexRayMacrotick", true, false},
+    {"kvBlink", true, false},
+    {"kvdbCloseDatabase", true, false},
 };
 
 }  // namespace

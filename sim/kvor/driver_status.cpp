@@ -28,6 +28,8 @@ constexpr StatusText kTexts[] = {
     {kvsimErrInvalidMode, "The session mode is not valid."},
     {kvsimErrInvalidList, "The session list contains an empty item."},
     {kvsimErrWrongMode, "The function is not available in the session's mode."},
+    {kvsimErrWrongProtocol, "The function is not available for the session's protocol."},
+    {kvsimErrInvalidScope, "The scope of the start or stop is not valid."},
     {kvsimErrPropertyUnknown, "The object has no such property, or the property has no value."},
     {kvsimErrPropertyReadOnly, "The property cannot be set."},
     {kvsimErrPropertySize, "The value size does not match the property's type."},
@@ -36,6 +38,10 @@ constexpr StatusText kTexts[] = {
     {kvsimErrTimeout, "The time limit elapsed before the operation completed."},
     {kvsimErrSessionCleared, "The session was cleared while the operation waited."},
     {kvsimErrInvalidCondition, "The wait condition is not valid."},
+    {kvsimErrInvalidTerminal,
+     "A terminal name is not valid, or the route joins a terminal to itself."},
+    {kvsimErrNotConnected, "The session has not connected these terminals."},
+    {kvsimErrInvalidDatabase, "The database handle is invalid, or the database has been closed."},
 
     // The driver keeps the texts of the language binding's statuses as well.
     {static_cast<Status>(0xBFF63001), "Internal error in the language binding; see its error log."},

@@ -42,15 +42,25 @@ const std::vector<DeviceRecord> &Devices() {
 
 std::optional<InterfacePlace> FindInterface(std::string_view name) {
   const std::vector<DeviceRecord> &devices = Devices();
+  uint32_t index = 0;
   for (uint32_t d = 0; d < devices.size(); ++d) {
     const std::vector<InterfaceRecord> &interfaces = devices[d].interfaces;
-    for (uint32_t p = 0; p < interfaces.size(); ++p) {
+    for (uint32_t p = 0; p < interfaces.size(); ++p, ++index) {
       if (SameNameIgnoringCase(name, interfaces[p].name)) {
-        return InterfacePlace{d + 1, p + 1, &interfaces[p]};
+        return InterfacePlace{d + 1, p + 1, index, &interfaces[p]};
       }
     }
   }
   return std::nullopt;
+}
+
+uint32_t InterfaceIndexAt(uint32_t device, uint32_t port) {
+  const std::vector<DeviceRecord> &devices = Devices();
+  uint32_t index = port - 1;
+  for (uint32_t d = 0; d + 1 < device; ++d) {
+    index += static_cast<uint32_t>(devices[d].interfaces.size());
+  }
+  return index;
 }
 
 }  // namespace nKvorSim

@@ -34,17 +34,24 @@ struct DeviceRecord {
 // Number of distinct networks among the interfaces.
 constexpr uint32_t kNetworkCount = 5;
 
+// Number of interfaces of all devices together.
+constexpr uint32_t kInterfaceCount = 9;
+
 // The devices, device n at index n - 1.
 const std::vector<DeviceRecord> &Devices();
 
 struct InterfacePlace {
   uint32_t device;  // 1-based
   uint32_t port;    // 1-based
+  uint32_t index;   // 0-based among all interfaces, device by device: a key for per-interface state
   const InterfaceRecord *record;
 };
 
 // The interface of that name, compared without regard to case.
 std::optional<InterfacePlace> FindInterface(std::string_view name);
+
+// InterfacePlace::index of port `port` of device `device`, both 1-based and in the inventory.
+uint32_t InterfaceIndexAt(uint32_t device, uint32_t port);
 
 }  // namespace nKvorSim
 

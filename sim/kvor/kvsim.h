@@ -48,6 +48,34 @@
  *   Signals           kvReadSignalSinglePoint needs mode 0, kvWriteSignalSinglePoint mode 3;
  *                     each buffer must hold 8 bytes per signal. Values travel over the session's
  *                     network by signal name (see kvsimSetSignalValues).
+ *   kvStart, kvStop   Change what runs, by scope (enum kvsimScope): a session and its interface
+ *                     each have a started state (kvsimSessionStarted, kvsimInterfaceStarted).
+ *                     Sessions and interfaces begin stopped; starting what is started, or
+ *                     stopping what is stopped, is allowed and changes nothing. Reads, writes and
+ *                     waits do not look at the state.
+ *   kvFlush           Empties the session: signal values that reached its network before the
+ *                     flush read as never set (0.0 at time 0) on this session until set again;
+ *                     other sessions and kvsimGetSignalValues still see them. An output session
+ *                     holds nothing to flush.
+ *   kvConnectTerminals, kvDisconnectTerminals
+ *                     Route a source terminal to a destination terminal for the session. Both
+ *                     are among the names below, spelt exactly, and differ from one another;
+ *                     otherwise kvsimErrInvalidTerminal (a null name: kvsimErrNullPointer).
+ *                     Connecting a connected route changes nothing; disconnecting a route the
+ *                     session has not connected is kvsimErrNotConnected. A clear drops the
+ *                     session's routes (kvsimTerminalsConnected).
+ *                       StartTrigger, Interface/StartTrigger, FrontPanel0, FrontPanel1,
+ *                       PXI_Trig0, PXI_Trig1, ..., PXI_Trig7
+ *   kvhdnCreateSvTiming_FlexRayMacrotick
+ *                     Only for sessions on a FlexRay interface (else kvsimErrWrongProtocol);
+ *                     puts KVSIM_MACROTICK_SOURCE(session) in the output.
+ *   kvBlink           Takes an interface handle of an open system (else kvsimErrInvalidObject)
+ *                     and a mode of enum kvsimBlinkMode (else kvsimErrInvalidArgument). The mode
+ *                     belongs to the interface, not to the handle: it stays after its system is
+ *                     closed, until set again or reset (kvsimBlinkMode).
+ *   kvdbCloseDatabase No call opens a database, so every handle is kvsimErrInvalidDatabase.
+ *   Error handles     kvBlink and kvdbCloseDatabase also answer an error session, given in place
+ *                     of their object, with its status, as the session calls do.
  */
 #ifndef KVSIM_H
 #define KVSIM_H
@@ -76,7 +104,8 @@ enum kvsimStatus {
   kvsimErrOutOfMemory = (int32_t)0xBFF62002,      /* the driver could not allocate memory */
   kvsimErrNullPointer = (int32_t)0xBFF62003,      /* a required pointer argument is null */
   kvsimErrInvalidArgument = (int32_t)0xBFF62004,  /* an argument is out of range (NaN time limit,
-                                                     non-negative status of an error session) */
+                                                     non-negative status of an error session,
+                                                     blink mode above 1) */
   kvsimErrInvalidSession = (int32_t)0xBFF62010,   /* not an open session: never made, or cleared */
   kvsimErrInvalidObject = (int32_t)0xBFF62011,    /* not a system, device or interface of an open
                                                      system */
@@ -86,6 +115,9 @@ enum kvsimStatus {
   kvsimErrInvalidMode = (int32_t)0xBFF62021,      /* session mode above 12 */
   kvsimErrInvalidList = (int32_t)0xBFF62022,      /* the list has an empty item */
   kvsimErrWrongMode = (int32_t)0xBFF62023,        /* the call does not fit the session's mode */
+  kvsimErrWrongProtocol = (int32_t)0xBFF62024,    /* the call does not fit the session's
+                                                     protocol */
+  kvsimErrInvalidScope = (int32_t)0xBFF62025,     /* kvStart or kvStop: scope above 2 */
   kvsimErrPropertyUnknown = (int32_t)0xBFF62030,  /* the object has no such property, or no value */
   kvsimErrPropertyReadOnly = (int32_t)0xBFF62031, /* the property cannot be set */
   kvsimErrPropertySize = (int32_t)0xBFF62032,     /* the size does not fit the property's type */
@@ -93,7 +125,11 @@ enum kvsimStatus {
   kvsimErrInvalidSubIndex = (int32_t)0xBFF62034,  /* sub-property index outside the session list */
   kvsimErrTimeout = (int32_t)0xBFF62040,          /* the time limit ran out */
   kvsimErrSessionCleared = (int32_t)0xBFF62041,  /* the session was cleared while the call waited */
-  kvsimErrInvalidCondition = (int32_t)0xBFF62042 /* kvWait does not know the condition */
+  kvsimErrInvalidCondition = (int32_t)0xBFF62042, /* kvWait does not know the condition */
+  kvsimErrInvalidTerminal = (int32_t)0xBFF62050,  /* not a terminal name, or a terminal routed to
+                                                     itself */
+  kvsimErrNotConnected = (int32_t)0xBFF62051,     /* the session has not connected that route */
+  kvsimErrInvalidDatabase = (int32_t)0xBFF62060   /* not an open database */
 };
 
 /* The status that the call log shows for a call that is still inside the driver. */
@@ -112,12 +148,31 @@ enum kvsimCondition {
   kvsimConditionIntfRemoteWakeup = 0x8003
 };
 
+/* ==== Scopes of kvStart and kvStop =========================================================== */
+
+/* Normal start: the session and its interface. Normal stop: the session, and its interface too if
+ * no other session on it is started; a clear of a started session stops it in the same way.
+ * Session only: the session's state alone. Interface only: the interface's state alone; the
+ * sessions on it keep theirs. */
+enum kvsimScope { kvsimScopeNormal = 0, kvsimScopeSessionOnly = 1, kvsimScopeInterfaceOnly = 2 };
+
+/* ==== Modes of kvBlink ======================================================================= */
+
+/* The interface's identification light: off, or blinking. */
+enum kvsimBlinkMode { kvsimBlinkOff = 0, kvsimBlinkOn = 1 };
+
+/* ==== FlexRay macrotick timing source ======================================================== */
+
+/* The token that kvhdnCreateSvTiming_FlexRayMacrotick gives for `session`: never 0. */
+#define KVSIM_MACROTICK_SOURCE(session) (0x4D54000000000000ull | (uint64_t)(uint32_t)(session))
+
 /* ==== Reset ================================================================================== */
 
 /* Back to the state of a freshly loaded driver: clears every session (calls blocked on one
- * return kvsimErrSessionCleared), closes every system, lifts every hold (held calls that wait on
- * no session go on), drops injected failures, the call log, the signal values and the raised
- * conditions, and sets the clock to 0. Handle generations keep counting, so a handle of before
+ * return kvsimErrSessionCleared), closes every system, stops every interface, turns every
+ * interface's light off, lifts every hold (held calls that wait on no session go on), drops
+ * injected failures, the call log, the signal values and the raised conditions, and sets the
+ * clock to 0. Handle generations keep counting, so a handle of before
  * the reset stays invalid. */
 KVSIM_API void kvsimReset(void);
 
@@ -159,11 +214,22 @@ KVSIM_API void kvsimClearFailures(void);
  *   kvSetSubProperty         object                     identifier  size           index
  *   kvReadSignalSinglePoint  session                    0           values size    timestamps size
  *   kvWriteSignalSinglePoint session                    0           values size    0
+ *   kvStart                  session                    0           scope          0
+ *   kvStop                   session                    0           scope          0
+ *   kvFlush                  session                    0           0              0
+ *   kvConnectTerminals       session                    0           0              0
+ *   kvDisconnectTerminals    session                    0           0              0
+ *   kvhdnCreateSvTiming_FlexRayMacrotick
+ *                            session                    0           0              0
+ *   kvBlink                  interface                  0           mode           0
+ *   kvdbCloseDatabase        database                   0           closeAll       0
  *
- * `text` holds the interface name of kvCreateSession (cut to 63 bytes), and is empty otherwise.
+ * `text` holds the interface name of kvCreateSession, and "source -> destination" for
+ * kvConnectTerminals and kvDisconnectTerminals (a null name as empty), cut to 63 bytes; it is
+ * empty otherwise.
  * `status` is the result, or KVSIM_STATUS_PENDING while the call is inside the driver. */
 typedef struct kvsimCallRecord {
-  char function[32];
+  char function[48]; /* the whole name of every driver function fits */
   uint32_t object;
   uint32_t propertyId;
   uint32_t size1;
@@ -242,6 +308,28 @@ KVSIM_API int32_t kvsimRaiseCondition(uint32_t session, uint32_t condition, uint
 
 /* Lowers `condition` on the session: later waits for it block again. Returns 0 or -1. */
 KVSIM_API int32_t kvsimLowerCondition(uint32_t session, uint32_t condition);
+
+/* ==== Session and interface state ============================================================ */
+
+/* 1 if the session is started, 0 if stopped; -1 for a session that is not open (error sessions
+ * included). */
+KVSIM_API int32_t kvsimSessionStarted(uint32_t session);
+
+/* 1 if the interface of that name (as kvCreateSession takes it, without a "/suffix") is started,
+ * 0 if stopped; -1 for a name that is not an interface. */
+KVSIM_API int32_t kvsimInterfaceStarted(const char *interfaceName);
+
+/* 1 if the session has connected the route from `source` to `destination`, 0 if not; -1 for a
+ * session that is not open (error sessions included) or a null name. */
+KVSIM_API int32_t kvsimTerminalsConnected(uint32_t session, const char *source,
+                                          const char *destination);
+
+/* Number of routes that the session has connected, or -1 as kvsimTerminalsConnected. */
+KVSIM_API int32_t kvsimTerminalConnectionCount(uint32_t session);
+
+/* The mode of enum kvsimBlinkMode of the interface of that name, or -1 for a name that is not an
+ * interface. */
+KVSIM_API int32_t kvsimBlinkMode(const char *interfaceName);
 
 /* ==== Counts ================================================================================= */
 

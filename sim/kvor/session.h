@@ -1,15 +1,18 @@
-// One session of the driver: its definition, the properties set on it, and the events its
-// blocked calls wait for. An error session has no definition and answers every use with the
-// status it was made with.
+// One session of the driver: its definition, the properties set on it, the events its blocked
+// calls wait for, the terminal routes it connected and the point up to which it was flushed. An
+// error session has no definition and answers every use with the status it was made with.
 #ifndef KVOR_SIM_SESSION_H
 #define KVOR_SIM_SESSION_H
 
+#include <atomic>
+#include <cstdint>
 #include <utility>
 
 #include "driver_status.h"
 #include "property_store.h"
 #include "session_definition.h"
 #include "session_events.h"
+#include "terminals.h"
 
 namespace nKvorSim {
 
@@ -26,12 +29,22 @@ class Session {
   PropertyStore &Store() { return store_; }
   const PropertyStore &Store() const { return store_; }
   SessionEvents &Events() { return events_; }
+  const SessionEvents &Events() const { return events_; }
+  TerminalConnections &Terminals() { return terminals_; }
+  const TerminalConnections &Terminals() const { return terminals_; }
+
+  // Signal values published on the network up to this publication number arrived before the
+  // latest flush, and the session no longer holds them.
+  uint64_t FlushedThrough() const { return flushedThrough_.load(); }
+  void MarkFlushed(uint64_t publication) { flushedThrough_.store(publication); }
 
  private:
   const SessionDefinition definition_;
   const Status errorStatus_ = 0;
   PropertyStore store_;
   SessionEvents events_;
+  TerminalConnections terminals_;
+  std::atomic<uint64_t> flushedThrough_{0};
 };
 
 }  // namespace nKvorSim

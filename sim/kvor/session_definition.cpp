@@ -54,6 +54,7 @@ Status MakeSessionDefinition(const char *database, const char *cluster, const ch
   if (status < 0) return status;
   definition->mode = mode;
   definition->protocol = place->record->protocol;
+  definition->interfaceIndex = place->index;
   definition->interfaceName = interfaceName;
   definition->database = database != nullptr ? database : "";
   definition->cluster = cluster != nullptr ? cluster : "";

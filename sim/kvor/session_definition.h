@@ -17,6 +17,7 @@ constexpr uint32_t kLastSessionMode = 12;
 struct SessionDefinition {
   uint32_t mode = 0;
   uint32_t protocol = 0;
+  uint32_t interfaceIndex = 0;  // InterfacePlace::index of the interface
   std::string interfaceName;  // as the creator gave it, "/suffix" included
   std::string database;
   std::string cluster;

@@ -20,7 +20,7 @@ Status ReadSignalSinglePoint(const Session &session, double *values, uint32_t va
   if (valuesSize < needed) return kvsimErrBufferTooSmall;
   if (timestamps != nullptr && timestampsSize < needed) return kvsimErrBufferTooSmall;
   if (count != 0 && values == nullptr) return kvsimErrNullPointer;
-  definition.network->Sample(definition.items, count, values, timestamps);
+  definition.network->Sample(definition.items, count, values, timestamps, session.FlushedThrough());
   return 0;
 }
 

@@ -11,7 +11,8 @@
 namespace nKvorSim {
 
 // For input single-point sessions: one value per signal, and one timestamp per signal if
-// `timestamps` is not null. Each buffer must hold 8 bytes per signal.
+// `timestamps` is not null. Each buffer must hold 8 bytes per signal. A signal that has not
+// arrived since the session was last flushed reads 0.0 at time 0.
 Status ReadSignalSinglePoint(const Session &session, double *values, uint32_t valuesSize,
                              uint64_t *timestamps, uint32_t timestampsSize);
 

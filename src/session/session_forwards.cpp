@@ -25,8 +25,8 @@ extern "C" KVSV_EXPORT kvsvStatus kvsvSessionDisconnectTerminals(uint32_t sessio
   return kvDisconnectTerminals(session, source, destination);
 }
 
-extern "C" KVSV_EXPORT kvsvStatus kvsvSessionCreateSvTiming_FlexRayMacrotick(
-    uint32_t session, uint64_t *timingSource) {
+extern "C" KVSV_EXPORT kvsvStatus
+kvsvSessionCreateSvTiming_FlexRayMacrotick(uint32_t session, uint64_t *timingSource) {
   return kvhdnCreateSvTiming_FlexRayMacrotick(session, timingSource);
 }
 

@@ -64,6 +64,73 @@ TEST_F(KvorCallLog, EachCallIsRecordedWithItsArgumentsAndResult) {
   }
 }
 
+TEST_F(KvorCallLog, ControlCallsAreRecordedWithTheirArguments) {
+  uint32_t session = 0;
+  ASSERT_EQ(kvCreateSession("DB", "C", "", "FlexRay2", kvMode_FrameInStream, &session), 0);
+  uint32_t system = 0;
+  ASSERT_EQ(kvSystemOpen(&system), 0);
+  uint32_t interfaces[2] = {};
+  ASSERT_EQ(kvGetProperty(system, kvPropSys_IntfRefsLIN, sizeof interfaces, interfaces), 0);
+  kvsimLogClear();
+  uint64_t token = 0;
+  const struct {
+    const char *function;
+    int32_t status;
+    int32_t (*run)(uint32_t session, uint32_t interfaceRef, uint64_t *token);
+    uint32_t object;
+    uint32_t size1;
+    const char *text;
+  } calls[] = {
+      {"kvStart", 0, [](uint32_t s, uint32_t, uint64_t *) { return kvStart(s, 1); }, session, 1,
+       ""},
+      {"kvStop", kvsimErrInvalidScope,
+       [](uint32_t s, uint32_t, uint64_t *) { return kvStop(s, 7); }, session, 7, ""},
+      {"kvFlush", 0, [](uint32_t s, uint32_t, uint64_t *) { return kvFlush(s); }, session, 0, ""},
+      {"kvConnectTerminals", 0,
+       [](uint32_t s, uint32_t, uint64_t *) {
+         return kvConnectTerminals(s, "PXI_Trig5", "Interface/StartTrigger");
+       },
+       session, 0, "PXI_Trig5 -> Interface/StartTrigger"},
+      {"kvDisconnectTerminals", kvsimErrNullPointer,
+       [](uint32_t s, uint32_t, uint64_t *) {
+         return kvDisconnectTerminals(s, nullptr, "FrontPanel0");
+       },
+       session, 0, " -> FrontPanel0"},
+      {"kvhdnCreateSvTiming_FlexRayMacrotick", 0,
+       [](uint32_t s, uint32_t, uint64_t *t) { return kvhdnCreateSvTiming_FlexRayMacrotick(s, t); },
+       session, 0, ""},
+      {"kvBlink", 0, [](uint32_t, uint32_t i, uint64_t *) { return kvBlink(i, 1); }, interfaces[1],
+       1, ""},
+      {"kvdbCloseDatabase", kvsimErrInvalidDatabase,
+       [](uint32_t, uint32_t, uint64_t *) { return kvdbCloseDatabase(0x03000042u, 1); },
+       0x03000042u, 1, ""},
+  };
+  for (const auto &call : calls) {
+    ASSERT_EQ(call.run(session, interfaces[1], &token), call.status) << call.function;
+  }
+  ASSERT_EQ(kvsimLogCount(), static_cast<int32_t>(std::size(calls)));
+  for (size_t i = 0; i < std::size(calls); ++i) {
+    const kvsimCallRecord record = EntryAt(static_cast<int32_t>(i));
+    EXPECT_STREQ(record.function, calls[i].function) << i;
+    EXPECT_EQ(record.object, calls[i].object) << record.function;
+    EXPECT_EQ(record.propertyId, 0u) << record.function;
+    EXPECT_EQ(record.size1, calls[i].size1) << record.function;
+    EXPECT_EQ(record.size2, 0u) << record.function;
+    EXPECT_EQ(record.status, calls[i].status) << record.function;
+    EXPECT_STREQ(record.text, calls[i].text) << record.function;
+  }
+}
+
+TEST_F(KvorCallLog, ARouteLongerThanTheTextIsCut) {
+  uint32_t session = 0;
+  ASSERT_EQ(kvCreateSession("DB", "C", "", "CAN1", kvMode_FrameInStream, &session), 0);
+  kvsimLogClear();
+  const std::string longName(100, 'T');
+  EXPECT_EQ(kvConnectTerminals(session, longName.c_str(), "StartTrigger"), kvsimErrInvalidTerminal);
+  const kvsimCallRecord record = EntryAt(0);
+  EXPECT_EQ(std::string(record.text), longName.substr(0, 63));
+}
+
 TEST_F(KvorCallLog, FailedCallsAreRecordedWithTheirStatus) {
   uint32_t session = 0;
   ASSERT_EQ(kvCreateSession("DB", "C", "", "CAN9", 0, &session), kvsimErrUnknownInterface);

@@ -16,7 +16,8 @@ struct Use {
   std::function<int32_t(uint32_t)> run;
 };
 
-// Every call that takes a session, with buffers that a wrong answer would touch.
+// Every call that takes a session, or an object that a failed open stands for, with buffers that
+// a wrong answer would touch.
 std::vector<Use> EveryUse(std::vector<uint8_t> &buffer, double &value, uint64_t &timestamp,
                           uint32_t &word) {
   return {
@@ -43,6 +44,17 @@ std::vector<Use> EveryUse(std::vector<uint8_t> &buffer, double &value, uint64_t 
       // A limit, so that a wrong answer shows as a failure rather than a hang.
       {"kvWait",
        [&](uint32_t h) { return kvWait(h, kvsimConditionIntfCommunicating, 0, &word, 5.0); }},
+      {"kvStart", [&](uint32_t h) { return kvStart(h, kvsimScopeNormal); }},
+      {"kvStop", [&](uint32_t h) { return kvStop(h, kvsimScopeNormal); }},
+      {"kvFlush", [&](uint32_t h) { return kvFlush(h); }},
+      {"kvConnectTerminals",
+       [&](uint32_t h) { return kvConnectTerminals(h, "PXI_Trig0", "StartTrigger"); }},
+      {"kvDisconnectTerminals",
+       [&](uint32_t h) { return kvDisconnectTerminals(h, "PXI_Trig0", "StartTrigger"); }},
+      {"kvhdnCreateSvTiming_FlexRayMacrotick",
+       [&](uint32_t h) { return kvhdnCreateSvTiming_FlexRayMacrotick(h, &timestamp); }},
+      {"kvBlink", [&](uint32_t h) { return kvBlink(h, kvsimBlinkOn); }},
+      {"kvdbCloseDatabase", [&](uint32_t h) { return kvdbCloseDatabase(h, 1); }},
   };
 }
 

@@ -1,5 +1,6 @@
 // Injected statuses: for the next N calls, until cleared, or for one property only. A failure
 // replaces the call; a warning rides on a call that succeeds.
+#include "control_calls.h"
 #include "kvor_test_support.h"
 
 namespace {
@@ -89,6 +90,33 @@ TEST_F(KvorFailureInjection, AWarningRidesOnASuccessfulCall) {
   EXPECT_EQ(kvGetProperty(session, kvPropSession_IntfBaudRate, 4, &count), kvsimErrPropertyUnknown)
       << "a call that fails keeps its failure";
   EXPECT_EQ(kvGetProperty(session, kvPropSession_Mode, 4, &count), 0);
+}
+
+TEST_F(KvorFailureInjection, EveryControlCallCanBeMadeToFailOrToWarn) {
+  for (const ControlCall &call : ControlCalls()) {
+    SCOPED_TRACE(call.function);
+    kvsimReset();
+    ControlScene failing = MakeControlScene();
+    call.prepare(failing);
+    ASSERT_EQ(kvsimFailCall(call.function, kHardwareFault, 1), 0);
+    EXPECT_EQ(call.run(failing), kHardwareFault);
+    if (call.effect) {
+      EXPECT_FALSE(call.effect(failing)) << "a failed call does nothing";
+    }
+    EXPECT_EQ(call.run(failing), call.status) << "the failure is used up";
+    if (call.effect) {
+      EXPECT_TRUE(call.effect(failing));
+    }
+
+    kvsimReset();
+    ControlScene warned = MakeControlScene();
+    call.prepare(warned);
+    ASSERT_EQ(kvsimFailCall(call.function, kWarning, 1), 0);
+    EXPECT_EQ(call.run(warned), call.status < 0 ? call.status : kWarning);
+    if (call.effect) {
+      EXPECT_TRUE(call.effect(warned)) << "a warned call does its work";
+    }
+  }
 }
 
 TEST_F(KvorFailureInjection, OnlyDriverFunctionsWithAStatusCanBeMadeToFail) {

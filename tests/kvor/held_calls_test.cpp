@@ -4,6 +4,7 @@
 #include <future>
 #include <vector>
 
+#include "control_calls.h"
 #include "kvor_test_support.h"
 
 namespace {
@@ -113,6 +114,41 @@ TEST_F(KvorHeldCalls, AHeldWaitParksBeforeItWaits) {
       << "a raised condition does not free a parked call";
   ASSERT_EQ(kvsimRelease("kvWait"), 0);
   EXPECT_EQ(wait.get(), 0);
+}
+
+TEST_F(KvorHeldCalls, EveryControlCallParksUntilReleased) {
+  for (const ControlCall &call : ControlCalls()) {
+    SCOPED_TRACE(call.function);
+    kvsimReset();
+    ControlScene scene = MakeControlScene();
+    call.prepare(scene);
+    ASSERT_EQ(kvsimHold(call.function), 0);
+    auto running = std::async(std::launch::async, [&] { return call.run(scene); });
+    ASSERT_EQ(kvsimWaitParked(call.function, 1), 1);
+    if (call.effect) {
+      EXPECT_FALSE(call.effect(scene)) << "parked before doing anything";
+    }
+    ASSERT_EQ(kvsimRelease(call.function), 0);
+    EXPECT_EQ(running.get(), call.status);
+    if (call.effect) {
+      EXPECT_TRUE(call.effect(scene));
+    }
+  }
+}
+
+TEST_F(KvorHeldCalls, ClearingTheSessionEndsAParkedControlCallOnIt) {
+  for (const ControlCall &call : ControlCalls()) {
+    if (!call.onSession) continue;
+    SCOPED_TRACE(call.function);
+    kvsimReset();
+    ControlScene scene = MakeControlScene();
+    call.prepare(scene);
+    ASSERT_EQ(kvsimHold(call.function), 0);
+    auto running = std::async(std::launch::async, [&] { return call.run(scene); });
+    ASSERT_EQ(kvsimWaitParked(call.function, 1), 1);
+    ASSERT_EQ(kvClear(scene.session), 0);
+    EXPECT_EQ(running.get(), kvsimErrSessionCleared);
+  }
 }
 
 TEST_F(KvorHeldCalls, OnlyDriverFunctionsCanBeHeld) {

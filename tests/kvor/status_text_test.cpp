@@ -20,13 +20,19 @@ std::string TextOf(int32_t status) {
 }
 
 constexpr int32_t kDriverStatuses[] = {
-    kvsimErrInternal,        kvsimErrOutOfMemory,      kvsimErrNullPointer,
-    kvsimErrInvalidArgument, kvsimErrInvalidSession,   kvsimErrInvalidObject,
-    kvsimErrTooManySessions, kvsimErrTooManySystems,   kvsimErrUnknownInterface,
-    kvsimErrInvalidMode,     kvsimErrInvalidList,      kvsimErrWrongMode,
-    kvsimErrPropertyUnknown, kvsimErrPropertyReadOnly, kvsimErrPropertySize,
-    kvsimErrBufferTooSmall,  kvsimErrInvalidSubIndex,  kvsimErrTimeout,
-    kvsimErrSessionCleared,  kvsimErrInvalidCondition, 0,
+    kvsimErrInternal,         kvsimErrOutOfMemory,
+    kvsimErrNullPointer,      kvsimErrInvalidArgument,
+    kvsimErrInvalidSession,   kvsimErrInvalidObject,
+    kvsimErrTooManySessions,  kvsimErrTooManySystems,
+    kvsimErrUnknownInterface, kvsimErrInvalidMode,
+    kvsimErrInvalidList,      kvsimErrWrongMode,
+    kvsimErrWrongProtocol,    kvsimErrInvalidScope,
+    kvsimErrPropertyUnknown,  kvsimErrPropertyReadOnly,
+    kvsimErrPropertySize,     kvsimErrBufferTooSmall,
+    kvsimErrInvalidSubIndex,  kvsimErrTimeout,
+    kvsimErrSessionCleared,   kvsimErrInvalidCondition,
+    kvsimErrInvalidTerminal,  kvsimErrNotConnected,
+    kvsimErrInvalidDatabase,  0,
 };
 
 TEST_F(KvorStatusText, EveryStatusOfTheDriverHasATextOfItsOwn) {
