@@ -31,9 +31,16 @@ inline std::string ManualSessionName(uint32_t handle) {
 inline tManualSession CreateManual(const char *list, uint32_t mode, const char *interfaceName) {
   tManualSession made;
   made.status = kvsvSessionManualCreate(":memory:", "", list, interfaceName, mode, &made.reference);
-  for (int32_t i = 0; i < svsimRefCount(); ++i) {
-    SvsimRefInfo info{};
-    if (svsimGetRef(i, &info) == 1 && info.cookie == made.reference) made.handle = info.handle;
+  // Other threads may register and remove references meanwhile, which shifts the positions of
+  // the list: scan again until the reference, which stays until this thread removes it, is seen.
+  for (int pass = 0; pass < 1000 && made.reference != 0; ++pass) {
+    for (int32_t i = 0; i < svsimRefCount(); ++i) {
+      SvsimRefInfo info{};
+      if (svsimGetRef(i, &info) == 1 && info.cookie == made.reference) {
+        made.handle = info.handle;
+        return made;
+      }
+    }
   }
   return made;
 }
