@@ -20,27 +20,27 @@ namespace {
 // What the host is told of each class: its name and the exports that open and close it.
 struct tClassEntry {
   uint32_t objectClass;
+  int32_t keep;
   const char *className;
   const char *openExport;
   const char *closeExport;
-  int32_t keep;
 };
 
 constexpr tClassEntry kClasses[] = {
-    {kClassDatabase, "KVOR Database", "kvsvdbDatabaseOpen", "kvsvdbDatabaseClose", 0},
-    {kClassCluster, "KVOR Cluster", "kvsvdbClusterOpen", "kvsvdbClusterClose", 1},
-    {kClassFrame, "KVOR Frame", "kvsvdbFrameOpen", "kvsvdbFrameClose", 1},
-    {kClassSignal, "KVOR Signal", "kvsvdbSignalOpen", "kvsvdbSignalClose", 1},
-    {kClassSubframe, "KVOR Subframe", "kvsvdbSubframeOpen", "kvsvdbSubframeClose", 1},
-    {kClassEcu, "KVOR ECU", "kvsvdbEcuOpen", "kvsvdbEcuClose", 1},
-    {kClassLinSchedule, "KVOR LIN Schedule", "kvsvdbLINSchedOpen", "kvsvdbLINSchedClose", 1},
-    {kClassLinScheduleEntry, "KVOR LIN Schedule Entry", "kvsvdbLINSchedEntryOpen",
-     "kvsvdbLINSchedEntryClose", 1},
-    {kClassPdu, "KVOR PDU", "kvsvdbPDUOpen", "kvsvdbPDUClose", 1},
-    {kClassSession, "KVOR Session", "kvsvSessionOpen", "kvsvSessionClose", 1},
-    {kClassSystem, "KVOR System", "kvsvSystemOpen", "kvsvSystemClose", 0},
-    {kClassDevice, "KVOR Device", "kvsvDeviceOpen", "kvsvDeviceClose", 0},
-    {kClassInterface, "KVOR Interface", "kvsvInterfaceOpen", "kvsvInterfaceClose", 0},
+    {kClassDatabase, 0, "KVOR Database", "kvsvdbDatabaseOpen", "kvsvdbDatabaseClose"},
+    {kClassCluster, 1, "KVOR Cluster", "kvsvdbClusterOpen", "kvsvdbClusterClose"},
+    {kClassFrame, 1, "KVOR Frame", "kvsvdbFrameOpen", "kvsvdbFrameClose"},
+    {kClassSignal, 1, "KVOR Signal", "kvsvdbSignalOpen", "kvsvdbSignalClose"},
+    {kClassSubframe, 1, "KVOR Subframe", "kvsvdbSubframeOpen", "kvsvdbSubframeClose"},
+    {kClassEcu, 1, "KVOR ECU", "kvsvdbEcuOpen", "kvsvdbEcuClose"},
+    {kClassLinSchedule, 1, "KVOR LIN Schedule", "kvsvdbLINSchedOpen", "kvsvdbLINSchedClose"},
+    {kClassLinScheduleEntry, 1, "KVOR LIN Schedule Entry", "kvsvdbLINSchedEntryOpen",
+     "kvsvdbLINSchedEntryClose"},
+    {kClassPdu, 1, "KVOR PDU", "kvsvdbPDUOpen", "kvsvdbPDUClose"},
+    {kClassSession, 1, "KVOR Session", "kvsvSessionOpen", "kvsvSessionClose"},
+    {kClassSystem, 0, "KVOR System", "kvsvSystemOpen", "kvsvSystemClose"},
+    {kClassDevice, 0, "KVOR Device", "kvsvDeviceOpen", "kvsvDeviceClose"},
+    {kClassInterface, 0, "KVOR Interface", "kvsvInterfaceOpen", "kvsvInterfaceClose"},
 };
 
 constexpr char kKind[] = "kvor";
