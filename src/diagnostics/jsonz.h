@@ -13,8 +13,8 @@ namespace jsonz {
 // present document and rewrites the tail. Returns a pointer to the document's last character.
 char *StoreDocument(char *buffer, size_t size, const char *text);
 
-// ---- Writer. A cursor stands inside an object: on its opening or closing brace, or where a
-// member starts. Each add returns the cursor just behind the new member, so that adds chain in
+// ---- Writer. A cursor stands inside an object: on its opening or closing brace, or on the comma
+// behind a member. Each add returns the cursor just behind the new member, so that adds chain in
 // order, or null when no room is left; a null cursor gives null at once, so that a chain needs
 // one test at its end. A failed add changes nothing.
 

@@ -1,14 +1,35 @@
 #include "support/fake_error_log.h"
 
 #include <atomic>
+#include <cstdlib>
+#include <filesystem>
 #include <stdexcept>
+#include <string>
 #include <utility>
+
+#include "diagnostics/error_log.h"
 
 namespace kvsvtest {
 
 namespace {
 
 std::atomic<cFakeErrorLog *> gInstalled{nullptr};
+
+// Between and after fakes the real log takes the reports; in a test program it lives in a
+// directory of the program's own, removed at exit, never in the system's error-log directory.
+struct tRealLogDirectory {
+  tRealLogDirectory() {
+    std::string pattern = (std::filesystem::temp_directory_path() / "kvsvlog.XXXXXX").string();
+    if (mkdtemp(pattern.data()) != nullptr) path = pattern;
+    // Without a directory of its own the log is pointed at one that does not exist: rows drop.
+    nKVSVAPI100::SetErrorLogDirectoryForTests(path.empty() ? "/nonexistent/kvsv-test-log" : path);
+  }
+  ~tRealLogDirectory() {
+    std::error_code ignored;
+    if (!path.empty()) std::filesystem::remove_all(path, ignored);
+  }
+  std::string path;
+} gRealLogDirectory;
 
 }  // namespace
 
@@ -19,7 +40,7 @@ cFakeErrorLog::cFakeErrorLog() {
 }
 
 cFakeErrorLog::~cFakeErrorLog() {
-  nKVSVAPI100::SetErrorLogProvider(nullptr, nullptr);
+  nKVSVAPI100::InstallErrorLog();
   nKVSVAPI100::ResetErrorLogInit();
   gInstalled.store(nullptr);
 }

@@ -21,8 +21,9 @@ struct tLogRecord {
 // What the next builds of the log do.
 enum class eBuild { kSucceed, kThrowStandard, kThrowOther, kNegativeCode, kPositiveCode };
 
-// Installs itself as the reporter's log for its lifetime; on destruction the reporter has no log
-// again and builds afresh at its next report. One at a time.
+// Installs itself as the reporter's log for its lifetime; on destruction the real log is the
+// reporter's log again (built in a temporary directory of the test program) and is built afresh
+// at the next report. One at a time.
 class cFakeErrorLog : public nKVSVAPI100::iErrorLog {
  public:
   cFakeErrorLog();

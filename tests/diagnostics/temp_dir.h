@@ -1,0 +1,48 @@
+// A directory of the test's own under the system's temporary directory, removed with its content.
+#ifndef KVSVAPI_TESTS_DIAGNOSTICS_TEMP_DIR_H
+#define KVSVAPI_TESTS_DIAGNOSTICS_TEMP_DIR_H
+
+#include <cstdlib>
+#include <fstream>
+#include <iterator>
+#include <stdexcept>
+#include <string>
+#include <filesystem>
+
+namespace kvsvtest {
+
+class cTempDir {
+ public:
+  cTempDir() {
+    std::string pattern = (std::filesystem::temp_directory_path() / "kvsvdiag.XXXXXX").string();
+    if (mkdtemp(pattern.data()) == nullptr) throw std::runtime_error("mkdtemp failed");
+    path_ = pattern;
+  }
+  ~cTempDir() {
+    std::error_code ignored;
+    std::filesystem::permissions(path_, std::filesystem::perms::owner_all, ignored);
+    std::filesystem::remove_all(path_, ignored);
+  }
+  cTempDir(const cTempDir &) = delete;
+  cTempDir &operator=(const cTempDir &) = delete;
+
+  const std::string &Path() const { return path_; }
+
+ private:
+  std::string path_;
+};
+
+inline std::string ReadFile(const std::string &path) {
+  std::ifstream in(path, std::ios::binary);
+  return std::string(std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>());
+}
+
+inline void WriteAt(const std::string &path, long offset, const std::string &text) {
+  std::fstream file(path, std::ios::in | std::ios::out | std::ios::binary);
+  file.seekp(offset);
+  file.write(text.data(), static_cast<std::streamsize>(text.size()));
+}
+
+}  // namespace kvsvtest
+
+#endif
