@@ -2,7 +2,6 @@
 
 #include <cerrno>
 #include <cstdio>
-#include <new>
 #include <vector>
 
 #include "paths/normalize_directory_text.h"
@@ -14,6 +13,8 @@ const char kShareDirFile[] = "/etc/orvane/share/share.dir";
 const char kShareDirDefault[] = "/usr/local/orvane/share";
 
 namespace {
+
+constexpr long kMaxShareDirFileSize = 1 << 20;
 
 // The whole file as bytes; a failure goes to `status` with its detail.
 std::string ReadWholeFile(const char *fileName, tJsonStatus &status) {
@@ -27,20 +28,15 @@ std::string ReadWholeFile(const char *fileName, tJsonStatus &status) {
   std::fseek(file, 0, SEEK_END);
   const long size = std::ftell(file);
   std::fseek(file, 0, SEEK_SET);
-  // A size that can't be told (a directory, a pipe) reads as a short read of nothing.
-  const std::size_t fileSize = size > 0 ? static_cast<std::size_t>(size) : 0;
-  std::vector<char> bytes;
-  try {
-    bytes.resize(fileSize);
-  } catch (const std::bad_alloc &) {
-    std::fclose(file);
-    SetOsFault(status, kMemoryFull, __FILE__, __LINE__, ENOMEM, "no room for the file");
-    return std::string();
-  }
+  // A size that can't be told, or that no directory text could have (a directory reports an
+  // end far beyond its content), reads as a short read of nothing rather than a huge buffer.
+  const bool plausible = size >= 0 && size <= kMaxShareDirFileSize;
+  const std::size_t fileSize = plausible ? static_cast<std::size_t>(size) : 0;
+  std::vector<char> bytes(fileSize);
   const std::size_t got = std::fread(bytes.data(), 1, fileSize, file);
   const int err = errno;
   std::fclose(file);
-  if (got != fileSize || size < 0) {
+  if (got != fileSize || !plausible) {
     const jsonz::tRetry retry = RetryFor(status);
     char *cursor = SetOsFault(status, kOsFault, __FILE__, __LINE__, err,
                               "didn't read full content of file");
