@@ -166,6 +166,29 @@ KVSV_EXPORT kvsvStatus kvsvDeviceClose(uint32_t device);
 KVSV_EXPORT kvsvStatus kvsvInterfaceOpen(SvHandle *name, uint32_t *interfaceRef);
 KVSV_EXPORT kvsvStatus kvsvInterfaceClose(uint32_t interfaceRef);
 
+/* ---- Paths ---------------------------------------------------------------------------------
+ * The directories of the driver's files, selected by name: "eDatabaseEditorSettingsIniDir",
+ * "eErrorLogDir", "eTemporarySessionTextFileDir", "eDatabaseCacheDir", "eAliasFileDir" or
+ * "eDatabaseConfigDir" (exact case). The text is in the multibyte encoding of the process locale.
+ * Each call computes the directory afresh; the two database configuration names also create it.
+ * 0xBFF63001: unknown or empty name, buffer too small, conversion or file system failure, or a
+ * host string that could not be stored. 0xBFF63010: out of memory. 0xBFF63015: a null pointer
+ * where a name of non-zero length, the size or the buffer is required. */
+
+/* Bytes that the directory named by the first `nameLength` bytes of `name` takes, its NUL
+ * included, into *size. */
+KVSV_EXPORT kvsvStatus kvsvPathGetMultibyteStringSizeInBytes(const char *name, uint64_t nameLength,
+                                                             uint64_t *size);
+
+/* Copies the directory with its NUL into `buffer`, filling the rest of `bufferSize` bytes with
+ * NUL; a buffer too small is left untouched. */
+KVSV_EXPORT kvsvStatus kvsvPathGetMultibyteString(const char *name, uint64_t nameLength,
+                                                  uint64_t bufferSize, char *buffer);
+
+/* Stores the directory named by the host string `name` in the host string `text` (a null handle
+ * or block reads as an empty name). */
+KVSV_EXPORT kvsvStatus kvsvGetPathMultibyteStringAsSvStr(SvHandle name, SvHandle text);
+
 /* ---- Signals ------------------------------------------------------------------------------- */
 
 /* Reads the latest value of every signal of `session` into the host double array `*values`
