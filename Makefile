@@ -2,12 +2,15 @@
 # make test   installs what is missing, builds, runs every test: plain, under AddressSanitizer and
 #             UndefinedBehaviorSanitizer, and the concurrency tests under ThreadSanitizer
 # make bench  builds and runs the benchmarks (optimised build)
+# make test-fuzz  builds the libFuzzer targets with clang and runs each for a short time over its
+#             seed corpus in fuzz/corpus
 
 JOBS ?= $(shell nproc)
-DEPS := libboost-dev libgtest-dev libgmock-dev libbenchmark-dev cmake ninja-build g++ binutils
+DEPS := libboost-dev libgtest-dev libgmock-dev libbenchmark-dev cmake ninja-build g++ binutils \
+        clang libclang-rt-14-dev
 CMAKE_FLAGS := -G Ninja -DKVSV_WERROR=ON
 
-.PHONY: all deps build demo test test-plain test-asan test-tsan bench clean
+.PHONY: all deps build demo test test-plain test-asan test-tsan test-fuzz bench clean
 
 all: build
 
@@ -42,7 +45,21 @@ test-tsan: deps
 	cmake --build build-tsan -j $(JOBS)
 	TSAN_OPTIONS=halt_on_error=1 ctest --test-dir build-tsan --output-on-failure -j $(JOBS) -L concurrency
 
-test: test-plain test-asan test-tsan
+FUZZ_SECONDS ?= 20
+
+# Each fuzzer X_fuzzer starts from fuzz/corpus/X and keeps what it finds in build-fuzz only.
+test-fuzz: deps
+	CC=clang CXX=clang++ cmake -S . -B build-fuzz $(CMAKE_FLAGS) -DCMAKE_BUILD_TYPE=RelWithDebInfo \
+	  -DKVSV_BUILD_TESTS=OFF -DKVSV_BUILD_DEMO=OFF -DKVSV_BUILD_FUZZ=ON
+	cmake --build build-fuzz -j $(JOBS)
+	@for fuzzer in build-fuzz/fuzz/*_fuzzer; do \
+	  name=$$(basename $$fuzzer _fuzzer); mkdir -p build-fuzz/found/$$name; \
+	  echo "fuzzing $$name for $(FUZZ_SECONDS) s"; \
+	  $$fuzzer -max_total_time=$(FUZZ_SECONDS) -print_final_stats=1 build-fuzz/found/$$name \
+	    fuzz/corpus/$$name || exit 1; \
+	done
+
+test: test-plain test-asan test-tsan test-fuzz
 
 bench: deps
 	cmake -S . -B build-bench $(CMAKE_FLAGS) -DCMAKE_BUILD_TYPE=Release -DKVSV_BUILD_TESTS=OFF \
@@ -51,4 +68,4 @@ bench: deps
 	./build-bench/bench/kvsvbench
 
 clean:
-	rm -rf build build-asan build-tsan build-bench
+	rm -rf build build-asan build-tsan build-bench build-fuzz
