@@ -35,6 +35,19 @@ class SystemFixture : public testing::Test {
     svsimReset();
   }
 
+  // Logged calls of `function` on `object`. The error log may open and close a system of its own
+  // when it is built at the first report, so system closes are counted per handle.
+  static int CallsOn(const char *function, uint32_t object) {
+    int calls = 0;
+    for (int32_t i = 0; i < kvsimLogCount(); ++i) {
+      kvsimCallRecord record{};
+      if (kvsimLogEntry(i, &record) == 1 && std::string(record.function) == function &&
+          record.object == object)
+        ++calls;
+    }
+    return calls;
+  }
+
   // A string handle that lives until the end of the test, at an address that stays put.
   SvHandle *Name(const char *text) {
     names_.push_back(svsimMakeString(text));

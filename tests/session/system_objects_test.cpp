@@ -102,15 +102,15 @@ TEST_F(SystemObjects, SessionCloseOfAnErrorHandleEndsOnlyTheErrorSession) {
 
   EXPECT_EQ(kvsvSessionClose(handle), 0);
   EXPECT_EQ(kvsimOpenSessionCount(), 0) << "the error session is cleared";
-  EXPECT_EQ(kvsimCountCalls("kvClear"), 1);
-  EXPECT_EQ(kvsimCountCalls("kvSystemClose"), 0);
+  EXPECT_EQ(CallsOn("kvClear", handle), 1);
+  EXPECT_EQ(CallsOn("kvSystemClose", system), 0);
   EXPECT_EQ(kvsvGetSystemRefCount(), 2u) << "the open's acquire is not given back";
   EXPECT_EQ(kvsimOpenSystemCount(), 1);
 
   // A second close finds no error child: the system is not touched.
   kvsimLogClear();
   EXPECT_EQ(kvsvSessionClose(handle), 0);
-  EXPECT_EQ(kvsimCountCalls("kvSystemClose"), 0);
+  EXPECT_EQ(CallsOn("kvSystemClose", system), 0);
   EXPECT_EQ(kvsvGetSystemRefCount(), 2u);
 }
 
