@@ -204,12 +204,17 @@ constexpr char kLogFileName[] = "kvorErr.log";
 std::atomic<cErrorLog *> gInstalledLog{nullptr};
 
 std::mutex gTestDirectoryLock;
-std::string gTestDirectory;
+
+// Built at first use: a test program may set it from its own static initialisers.
+std::string &TestDirectory() {
+  static std::string directory;
+  return directory;
+}
 
 std::string LogDirectory() {
   {
     std::lock_guard<std::mutex> lock(gTestDirectoryLock);
-    if (!gTestDirectory.empty()) return gTestDirectory;
+    if (!TestDirectory().empty()) return TestDirectory();
   }
   return kvpath::cSvCgSupportLibraryPathMaker::MakePath(kvpath::eErrorLogDir)->GetMultibyte();
 }
@@ -248,7 +253,7 @@ void InstallErrorLog() { SetErrorLogProvider(&BuildProcessLog, &ProcessLog); }
 
 void SetErrorLogDirectoryForTests(const std::string &directory) {
   std::lock_guard<std::mutex> lock(gTestDirectoryLock);
-  gTestDirectory = directory;
+  TestDirectory() = directory;
 }
 
 }  // namespace nKVSVAPI100
