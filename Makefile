@@ -42,7 +42,7 @@ test-asan: deps
 test-tsan: deps
 	cmake -S . -B build-tsan $(CMAKE_FLAGS) -DCMAKE_BUILD_TYPE=Debug -DKVSV_BUILD_DEMO=OFF \
 	  -DKVSV_SANITIZE=thread
-	cmake --build build-tsan -j $(JOBS)
+	cmake --build build-tsan -j $(JOBS) --target concurrency_tests
 	TSAN_OPTIONS=halt_on_error=1 ctest --test-dir build-tsan --output-on-failure -j $(JOBS) -L concurrency
 
 FUZZ_SECONDS ?= 20
