@@ -109,6 +109,20 @@ int32_t kvDisconnectTerminals(uint32_t session, const char *source, const char *
 int32_t kvhdnCreateSvTiming_FlexRayMacrotick(uint32_t session, uint64_t *timingSource);
 int32_t kvBlink(uint32_t interfaceRef, uint32_t mode);
 
+/* Frames. Buffers hold the driver's packed frame records; sizes are in bytes. kvReadFrame fills
+ * 24-byte records, kvhdnReadFrame records of each frame's own size, at most `numFrames`. */
+int32_t kvReadFrame(uint32_t session, void *buffer, uint32_t size, double timeout,
+                    uint32_t *bytesReturned);
+int32_t kvhdnReadFrame(uint32_t session, void *buffer, uint32_t size, uint32_t numFrames,
+                       double timeout, uint32_t *bytesReturned);
+int32_t kvWriteFrame(uint32_t session, const void *buffer, uint32_t size, double timeout);
+/* Ethernet frames travel through descriptors that point at the payload bytes: 40-byte read
+ * descriptors, 16-byte write descriptors. */
+int32_t kvhdnReadFrameEthernet(uint32_t session, void *descriptors, uint32_t numFrames,
+                               int32_t *numReturned, double timeout);
+int32_t kvhdnWriteFrameEthernet(uint32_t session, const void *descriptors, uint32_t numFrames,
+                                double timeout);
+
 /* Databases. */
 int32_t kvdbCloseDatabase(uint32_t database, uint32_t closeAll);
 
