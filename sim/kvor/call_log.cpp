@@ -7,6 +7,8 @@ namespace nKvorSim {
 
 uint64_t CallLog::Append(const CallArgs &args) {
   std::lock_guard<std::mutex> lock(mutex_);
+  // A number that no record ever has, so that Complete leaves it alone.
+  if (!enabled_) return UINT64_MAX;
   calls_.push_back(Call{args, KVSIM_STATUS_PENDING});
   if (calls_.size() > kCapacity) {
     calls_.pop_front();
@@ -49,6 +51,11 @@ void CallLog::Clear() {
   // emptied finds nothing to complete.
   firstSequence_ += calls_.size();
   calls_.clear();
+}
+
+void CallLog::SetEnabled(bool enabled) {
+  std::lock_guard<std::mutex> lock(mutex_);
+  enabled_ = enabled;
 }
 
 size_t CallLog::CountCalls(std::string_view function) const {

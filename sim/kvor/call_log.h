@@ -31,7 +31,8 @@ class CallLog {
   // The latest calls kept; a bound so that a long benchmark cannot exhaust memory.
   static constexpr size_t kCapacity = size_t{1} << 20;
 
-  // Records a call on entry; the result is its sequence number for Complete.
+  // Records a call on entry, unless the log is off; the result is its sequence number for
+  // Complete.
   uint64_t Append(const CallArgs &args);
   // Fills in the outcome; a call dropped from the log meanwhile is left alone.
   void Complete(uint64_t sequence, uint32_t object, Status status);
@@ -39,6 +40,8 @@ class CallLog {
   size_t Count() const;
   std::optional<kvsimCallRecord> Entry(size_t index) const;
   void Clear();
+  // While off, calls enter no record, so that a benchmark pays nothing for the log.
+  void SetEnabled(bool enabled);
 
   size_t CountCalls(std::string_view function) const;
   // Reads of a property through kvGetPropertySize, kvGetProperty and kvGetSubProperty.
@@ -53,6 +56,7 @@ class CallLog {
   mutable std::mutex mutex_;
   std::deque<Call> calls_;
   uint64_t firstSequence_ = 0;  // sequence number of calls_.front()
+  bool enabled_ = true;
 };
 
 }  // namespace nKvorSim

@@ -41,8 +41,10 @@ void Driver::Reset() {
   blinking_.Reset();
   failures_.Clear();
   for (Network &network : networks_) network.Clear();
+  bus_.Reset();
   clock_.Set(0);
   log_.Clear();
+  log_.SetEnabled(true);
   // Last, so that a parked call that goes on does its work in the fresh driver.
   holds_.ReleaseAll();
 }

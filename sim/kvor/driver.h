@@ -12,6 +12,7 @@
 #include "database_registry.h"
 #include "driver_status.h"
 #include "failure_plan.h"
+#include "frame_bus.h"
 #include "network.h"
 #include "run_states.h"
 #include "session_registry.h"
@@ -30,6 +31,7 @@ class Driver {
   CallCounter &Blocked() { return blocked_; }
   VirtualClock &Clock() { return clock_; }
   NetworkSet &Networks() { return networks_; }
+  FrameBus &Bus() { return bus_; }
   SessionRegistry &Sessions() { return sessions_; }
   SystemRegistry &Systems() { return systems_; }
   RunStates &Running() { return running_; }
@@ -56,6 +58,7 @@ class Driver {
   CallCounter blocked_;
   VirtualClock clock_;
   NetworkSet networks_;
+  FrameBus bus_;
   SessionRegistry sessions_;
   SystemRegistry systems_;
   RunStates running_;

@@ -27,6 +27,11 @@ constexpr DriverFunction kFunctions[] = {
     {"kvhdnCreateSvTiming_FlexRayMacrotick", true, false},
     {"kvBlink", true, false},
     {"kvdbCloseDatabase", true, false},
+    {"kvReadFrame", true, false},
+    {"kvhdnReadFrame", true, false},
+    {"kvWriteFrame", true, false},
+    {"kvhdnReadFrameEthernet", true, false},
+    {"kvhdnWriteFrameEthernet", true, false},
 };
 
 }  // namespace

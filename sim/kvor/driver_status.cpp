@@ -42,6 +42,8 @@ constexpr StatusText kTexts[] = {
      "A terminal name is not valid, or the route joins a terminal to itself."},
     {kvsimErrNotConnected, "The session has not connected these terminals."},
     {kvsimErrInvalidDatabase, "The database handle is invalid, or the database has been closed."},
+    {kvsimErrInvalidFrame,
+     "The frame buffer holds a malformed record, or a payload longer than the session allows."},
 
     // The driver keeps the texts of the language binding's statuses as well.
     {static_cast<Status>(0xBFF63001), "Internal error in the language binding; see its error log."},

@@ -48,6 +48,68 @@
  *   Signals           kvReadSignalSinglePoint needs mode 0, kvWriteSignalSinglePoint mode 3;
  *                     each buffer must hold 8 bytes per signal. Values travel over the session's
  *                     network by signal name (see kvsimSetSignalValues).
+ *   Frames            Frame sessions are modes 6 to 8 (input stream, queued, single point) and
+ *                     9 to 11 (output). A frame that an output session writes goes out at once,
+ *                     stamped with the clock, and arrives at every frame input session on the
+ *                     other interfaces of its network. On the writer's own interface it arrives
+ *                     only when the writer has kvPropSession_IntfEchoTx set, as an echo: Flags
+ *                     bit 7 of a record, bit 0 of an Ethernet descriptor. ENET1, alone on its
+ *                     network, hears what it sends: each input session on ENET1 gets it, marked
+ *                     as an echo only if the writer has echo set.
+ *                     List items of frame sessions name frames by identifier: "0x123" standard,
+ *                     "0x18FEF100x" extended (trailing x), each with an optional ":LEN" payload
+ *                     length in decimal (else the session's payload maximum). An item of any
+ *                     other form is kept but names no frame.
+ *                     Properties of frame sessions, settable unless told: PayldLenMax (Ethernet
+ *                     1500, FlexRay 254, LIN 8, CAN 1785 with ApplicationProtocol 1 (J1939), 64
+ *                     with IntfCanIoMode non-zero (CAN FD), else 8), QueueSize (bytes; default
+ *                     4096 records of the payload maximum), IntfCanIoMode, ApplicationProtocol
+ *                     and IntfEchoTx (0), NumPend (read-only: frames waiting in an input queue),
+ *                     and per item kvPropHidden_FramePayloadLen (the item's length).
+ *                     An input stream or queued session queues what arrives. It holds QueueSize /
+ *                     recordSize(PayldLenMax) frames, as both stand when a frame arrives; a frame
+ *                     that finds it full is dropped and counted (kvsimDroppedFrames). A
+ *                     single-point input session keeps the latest frame of each list item, matched
+ *                     by identifier; an item that has had no frame since the session was made or
+ *                     flushed reads as its identifier at time 0, Type, Flags and Info 0, with a
+ *                     payload of zeros of the item's length.
+ *   kvReadFrame, kvhdnReadFrame
+ *                     Input sessions only (else kvsimErrWrongMode), not Ethernet (else
+ *                     kvsimErrWrongProtocol). kvReadFrame gives records of the session's form:
+ *                     24 bytes each for LIN and classic CAN, recordSize(L) each for CAN FD,
+ *                     J1939 (the long form, Type 0xC0, above 255 bytes) and FlexRay.
+ *                     kvhdnReadFrame gives recordSize(L) records, at most numFrames. Both give
+ *                     only whole records, as many as fit into `size`, oldest first; a
+ *                     single-point session gives one per list item, in list order. A 24-byte
+ *                     record holds at most 8 payload bytes and says so.
+ *                     Time limit 0: what is there. Otherwise (seconds, negative for none) the
+ *                     read waits until what it asks for is all there (numFrames records, or
+ *                     records that fill `size`) and takes it, or, when the limit runs out, takes
+ *                     what is there and returns 0. A clear of the session ends the wait with
+ *                     kvsimErrSessionCleared; a NaN limit is kvsimErrInvalidArgument. Single-point
+ *                     reads never wait. On an error the outputs are untouched.
+ *   kvWriteFrame      Output sessions only, not Ethernet. The buffer holds records of the
+ *                     session's form; it is refused whole with kvsimErrInvalidFrame, and nothing
+ *                     is sent, if a fixed-form size is not a multiple of 24, a record runs past
+ *                     `size` or cannot hold the payload it claims, or a payload is longer than
+ *                     PayldLenMax (or than 8 in a 24-byte record). Nothing past `size` is read; a
+ *                     null buffer of size 0 sends nothing. The records' Timestamp is not used;
+ *                     Flags bit 7 is cleared on the way. The time limit is accepted and never
+ *                     needed: what is taken is sent at once.
+ *   kvhdnReadFrameEthernet
+ *                     Ethernet input stream or queued sessions (a single-point session:
+ *                     kvsimErrWrongMode). Waits as kvhdnReadFrame does for numFrames frames,
+ *                     then fills a descriptor per frame, in order: the frame's bytes go to Data,
+ *                     at most Length of them (Data 0 takes none); Length becomes the bytes
+ *                     stored; Flags bit 0 marks an echo, bit 3 a frame cut to fit, the reserved
+ *                     word holds the frame's whole length; Word is the frame's number on its
+ *                     network (1 for the first after a reset); FirstTime (arrival) and
+ *                     SecondTime (transmission) are the clock in 1 ns units since 1970 (a clock
+ *                     before 1970 gives its own value times 100).
+ *   kvhdnWriteFrameEthernet
+ *                     Ethernet output sessions. Refused whole with kvsimErrInvalidFrame if a
+ *                     descriptor's Length is above PayldLenMax, or its Data is 0 with a Length
+ *                     that is not; Data 0 with Length 0 is an empty frame.
  *   kvStart, kvStop   Change what runs, by scope (enum kvsimScope): a session and its interface
  *                     each have a started state (kvsimSessionStarted, kvsimInterfaceStarted).
  *                     Sessions and interfaces begin stopped; starting what is started, or
@@ -55,8 +117,9 @@
  *                     waits do not look at the state.
  *   kvFlush           Empties the session: signal values that reached its network before the
  *                     flush read as never set (0.0 at time 0) on this session until set again;
- *                     other sessions and kvsimGetSignalValues still see them. An output session
- *                     holds nothing to flush.
+ *                     other sessions and kvsimGetSignalValues still see them. A frame input
+ *                     session drops its queued frames, and its single-point frames read as never
+ *                     received. An output session holds nothing to flush.
  *   kvConnectTerminals, kvDisconnectTerminals
  *                     Route a source terminal to a destination terminal for the session. Both
  *                     are among the names below, spelt exactly, and differ from one another;
@@ -129,7 +192,9 @@ enum kvsimStatus {
   kvsimErrInvalidTerminal = (int32_t)0xBFF62050,  /* not a terminal name, or a terminal routed to
                                                      itself */
   kvsimErrNotConnected = (int32_t)0xBFF62051,     /* the session has not connected that route */
-  kvsimErrInvalidDatabase = (int32_t)0xBFF62060   /* not an open database */
+  kvsimErrInvalidDatabase = (int32_t)0xBFF62060,  /* not an open database */
+  kvsimErrInvalidFrame = (int32_t)0xBFF62080      /* a frame write holds a malformed record or a
+                                                     payload over the session's maximum */
 };
 
 /* The status that the call log shows for a call that is still inside the driver. */
@@ -171,9 +236,9 @@ enum kvsimBlinkMode { kvsimBlinkOff = 0, kvsimBlinkOn = 1 };
 /* Back to the state of a freshly loaded driver: clears every session (calls blocked on one
  * return kvsimErrSessionCleared), closes every system, stops every interface, turns every
  * interface's light off, lifts every hold (held calls that wait on no session go on), drops
- * injected failures, the call log, the signal values and the raised conditions, and sets the
- * clock to 0. Handle generations keep counting, so a handle of before
- * the reset stays invalid. */
+ * injected failures, the call log (and turns it on), the signal values, the frames and the raised
+ * conditions, numbers frames from 1 again, and sets the clock to 0. Handle generations keep
+ * counting, so a handle of before the reset stays invalid. */
 KVSIM_API void kvsimReset(void);
 
 /* ==== Injected failures ====================================================================== */
@@ -223,6 +288,11 @@ KVSIM_API void kvsimClearFailures(void);
  *                            session                    0           0              0
  *   kvBlink                  interface                  0           mode           0
  *   kvdbCloseDatabase        database                   0           closeAll       0
+ *   kvReadFrame              session                    0           size           0
+ *   kvhdnReadFrame           session                    0           size           numFrames
+ *   kvWriteFrame             session                    0           size           0
+ *   kvhdnReadFrameEthernet   session                    0           numFrames      0
+ *   kvhdnWriteFrameEthernet  session                    0           numFrames      0
  *
  * `text` holds the interface name of kvCreateSession, and "source -> destination" for
  * kvConnectTerminals and kvDisconnectTerminals (a null name as empty), cut to 63 bytes; it is
@@ -255,6 +325,10 @@ KVSIM_API int32_t kvsimCountCalls(const char *function);
 /* Number of logged kvGetPropertySize, kvGetProperty and kvGetSubProperty calls for `propertyId`,
  * on any object. */
 KVSIM_API int32_t kvsimCountPropertyReads(uint32_t propertyId);
+
+/* Turns the log off (0) or on (non-zero). While it is off driver calls are not recorded, so that
+ * a benchmark measures no logging; holds and injected failures still apply. On after a reset. */
+KVSIM_API void kvsimSetCallLog(int32_t on);
 
 /* ==== Virtual clock ========================================================================== */
 
@@ -298,6 +372,43 @@ KVSIM_API int32_t kvsimSetSignalValues(uint32_t session, const double *values, i
  * `max`; a signal never set reads 0.0). Returns the session's number of signals, or -1 as
  * kvsimSetSignalValues. */
 KVSIM_API int32_t kvsimGetSignalValues(uint32_t session, double *values, int32_t max);
+
+/* ==== Frames ================================================================================= */
+
+/* Puts the variable-form records (recordSize(L) bytes each, the long form for Type 0xC0) into the
+ * input session as received, Timestamp, Type, Flags and Info as given: at the end of its queue,
+ * subject to its length, or as the latest frame of the list items that name them. Returns the
+ * number of records, or -1 for a session that is not a frame input session, a null `records` with
+ * a non-zero size, or records that do not exactly fill `size`. */
+KVSIM_API int32_t kvsimQueueFrames(uint32_t session, const void *records, uint32_t size);
+
+/* From now on kvReadFrame and kvhdnReadFrame on the input session do nothing but copy these bytes
+ * as they are, whatever they hold: as many as fit into the read's size, and for kvhdnReadFrame no
+ * more than its first numFrames records, walked as the variable form, take; bytesReturned is that
+ * count. `repeat` non-zero serves the same bytes to every read until the next
+ * kvsimSetReadStream; zero serves them to the next read only, after which reads take frames
+ * again. The checks of the session, mode and protocol still come first. Returns 0, or -1 for a
+ * session that is not a frame input session or a null `bytes` with a non-zero size. */
+KVSIM_API int32_t kvsimSetReadStream(uint32_t session, const void *bytes, uint32_t size,
+                                     int32_t repeat);
+
+/* Copies into `buffer` up to `size` bytes that the last successful kvWriteFrame on the output
+ * session was given, and returns how many it was given (0 before any). -1 for a session that is
+ * not a frame output session, or a null `buffer` with a non-zero size. */
+KVSIM_API int32_t kvsimLastWrite(uint32_t session, void *buffer, uint32_t size);
+
+/* The number of frames of the last successful kvhdnWriteFrameEthernet on the output session (0
+ * before any), or -1 as kvsimLastWrite. */
+KVSIM_API int32_t kvsimLastEthernetWriteCount(uint32_t session);
+
+/* Copies up to `size` bytes of frame `index` of that write into `buffer` and returns the frame's
+ * length; -1 as kvsimLastWrite, or for an index beyond the write's frames. */
+KVSIM_API int32_t kvsimLastEthernetWrite(uint32_t session, uint32_t index, void *buffer,
+                                         uint32_t size);
+
+/* Number of frames dropped since the input session was made because its queue was full, or -1
+ * for a session that is not a frame input session. A flush keeps the count. */
+KVSIM_API int32_t kvsimDroppedFrames(uint32_t session);
 
 /* ==== Wait conditions ======================================================================== */
 

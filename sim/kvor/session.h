@@ -1,6 +1,7 @@
 // One session of the driver: its definition, the properties set on it, the events its blocked
-// calls wait for, the terminal routes it connected and the point up to which it was flushed. An
-// error session has no definition and answers every use with the status it was made with.
+// calls wait for, the terminal routes it connected, the point up to which it was flushed, and its
+// frame traffic. An error session has no definition and answers every use with the status it was
+// made with.
 #ifndef KVOR_SIM_SESSION_H
 #define KVOR_SIM_SESSION_H
 
@@ -9,6 +10,9 @@
 #include <utility>
 
 #include "driver_status.h"
+#include "frame_inbox.h"
+#include "frame_last_writes.h"
+#include "frame_read_stream.h"
 #include "property_store.h"
 #include "session_definition.h"
 #include "session_events.h"
@@ -32,6 +36,10 @@ class Session {
   const SessionEvents &Events() const { return events_; }
   TerminalConnections &Terminals() { return terminals_; }
   const TerminalConnections &Terminals() const { return terminals_; }
+  FrameInbox &Frames() { return frames_; }
+  const FrameInbox &Frames() const { return frames_; }
+  FrameReadStream &ReadStream() { return readStream_; }
+  FrameLastWrites &LastWrites() { return lastWrites_; }
 
   // Signal values published on the network up to this publication number arrived before the
   // latest flush, and the session no longer holds them.
@@ -44,6 +52,9 @@ class Session {
   PropertyStore store_;
   SessionEvents events_;
   TerminalConnections terminals_;
+  FrameInbox frames_;
+  FrameReadStream readStream_;
+  FrameLastWrites lastWrites_;
   std::atomic<uint64_t> flushedThrough_{0};
 };
 

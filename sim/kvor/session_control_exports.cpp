@@ -57,11 +57,12 @@ KVOR_DRIVER_API int32_t kvStop(uint32_t session, uint32_t scope) {
   });
 }
 
-// Signal values are the only data that a session holds yet: a flush drops those that arrived so
-// far. An output session holds nothing, since what it writes is on the network at once.
+// A flush drops the signal values and frames that arrived so far. An output session holds
+// nothing, since what it writes is on the network at once.
 KVOR_DRIVER_API int32_t kvFlush(uint32_t session) {
   return RunSessionCall(SessionCall("kvFlush", session), session, [&](Session &target) {
     target.MarkFlushed(target.Definition().network->LastPublication());
+    target.Frames().Flush();
     return Status{0};
   });
 }

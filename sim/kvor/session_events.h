@@ -6,6 +6,7 @@
 #include <atomic>
 #include <condition_variable>
 #include <cstdint>
+#include <functional>
 #include <map>
 #include <mutex>
 #include <string_view>
@@ -25,6 +26,16 @@ class SessionEvents {
   // call counts in `blocked` under `function`.
   Status WaitFor(uint32_t condition, double timeLimit, uint32_t *value, CallCounter &blocked,
                  std::string_view function);
+
+  // Blocks until `ready` holds, the time limit in seconds runs out (negative: none), or the session
+  // is cleared; kvsimErrSessionCleared for the clear, 0 otherwise, so the caller looks at what
+  // it waited for. `ready` is called with this object's lock held: whatever it looks at must be
+  // changed before Notify, so that a change cannot slip past the wait. While it is blocked the call
+  // counts in `blocked` under `function`.
+  Status WaitUntil(const std::function<bool()> &ready, double timeLimit, CallCounter &blocked,
+                   std::string_view function);
+  // Wakes the waits of WaitUntil to look at their `ready` again.
+  void Notify();
 
   void Raise(uint32_t condition, uint32_t value);
   void Lower(uint32_t condition);

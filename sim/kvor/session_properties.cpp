@@ -3,6 +3,7 @@
 #include <optional>
 #include <string>
 
+#include "frame_properties.h"
 #include "kvorproperties.h"
 #include "kvsim.h"
 #include "property_value.h"
@@ -41,11 +42,18 @@ std::optional<PropertyValue> DefinedProperty(const SessionDefinition &definition
   }
 }
 
-std::optional<PropertyValue> PropertyOf(const Session &session, uint32_t id) {
+// Read-only values first, then what was set, then the defaults of frame sessions.
+std::optional<PropertyValue> ReadOnlyProperty(const Session &session, uint32_t id) {
   if (std::optional<PropertyValue> defined = DefinedProperty(session.Definition(), id)) {
     return defined;
   }
-  return session.Store().Get(id);
+  return FrameReadOnlyProperty(session, id);
+}
+
+std::optional<PropertyValue> PropertyOf(const Session &session, uint32_t id) {
+  if (std::optional<PropertyValue> fixed = ReadOnlyProperty(session, id)) return fixed;
+  if (std::optional<PropertyValue> stored = session.Store().Get(id)) return stored;
+  return FrameDefaultProperty(session, id);
 }
 
 Status CheckIndex(const Session &session, uint32_t index) {
@@ -69,7 +77,7 @@ Status GetSessionProperty(const Session &session, uint32_t id, uint32_t size, vo
 }
 
 Status SetSessionProperty(Session &session, uint32_t id, uint32_t size, const void *value) {
-  if (DefinedProperty(session.Definition(), id)) return kvsimErrPropertyReadOnly;
+  if (ReadOnlyProperty(session, id)) return kvsimErrPropertyReadOnly;
   PropertyValue bytes;
   const Status status = ValueFromCaller(id, size, value, &bytes);
   if (status < 0) return status;
@@ -81,7 +89,8 @@ Status GetSessionSubProperty(const Session &session, uint32_t index, uint32_t id
                              void *value) {
   const Status status = CheckIndex(session, index);
   if (status < 0) return status;
-  const std::optional<PropertyValue> stored = session.Store().GetSub(index, id);
+  std::optional<PropertyValue> stored = session.Store().GetSub(index, id);
+  if (!stored) stored = FrameDefaultSubProperty(session, index, id);
   if (!stored) return kvsimErrPropertyUnknown;
   return CopyValueOut(*stored, size, value);
 }

@@ -47,6 +47,14 @@ std::vector<std::shared_ptr<Session>> SessionRegistry::RemoveAll() {
   return removed;
 }
 
+std::vector<std::shared_ptr<Session>> SessionRegistry::All() const {
+  std::lock_guard<std::mutex> lock(mutex_);
+  std::vector<std::shared_ptr<Session>> all;
+  all.reserve(sessions_.size());
+  for (const auto &entry : sessions_) all.push_back(entry.second);
+  return all;
+}
+
 size_t SessionRegistry::Count() const {
   std::lock_guard<std::mutex> lock(mutex_);
   return sessions_.size();

@@ -26,6 +26,8 @@ class SessionRegistry {
   // Takes the session out of the registry; the caller wakes what waits on it.
   std::shared_ptr<Session> Remove(uint32_t handle);
   std::vector<std::shared_ptr<Session>> RemoveAll();
+  // The open sessions at this moment, error sessions included.
+  std::vector<std::shared_ptr<Session>> All() const;
   size_t Count() const;
 
  private:
