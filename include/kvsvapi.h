@@ -189,6 +189,28 @@ KVSV_EXPORT kvsvStatus kvsvPathGetMultibyteString(const char *name, uint64_t nam
  * or block reads as an empty name). */
 KVSV_EXPORT kvsvStatus kvsvGetPathMultibyteStringAsSvStr(SvHandle name, SvHandle text);
 
+/* ---- Frame writes -------------------------------------------------------------------------- */
+
+/* Sends the frames of the host array `frames` (count at byte 0, 32-byte CAN, 32-byte LIN or
+ * 40-byte FlexRay clusters from byte 8) in one driver call, as records in the form the session
+ * wants. An empty array goes to the driver with no look at the session. `timeout` goes to the
+ * driver; any value but 0.0 lets the host abort the session if the program stops meanwhile.
+ * 0xBFF63020: no such session. 0xBFF63027: the session is in use by another call or closing.
+ * 0xBFF6309F: a payload is longer than the session allows; none of the frames is sent.
+ * 0xBFF63010: no memory for the records. Otherwise the driver's status. */
+KVSV_EXPORT kvsvStatus kvsvWriteFrameCAN(uint32_t session, SvHandle frames, double timeout);
+KVSV_EXPORT kvsvStatus kvsvWriteFrameLIN(uint32_t session, SvHandle frames, double timeout);
+KVSV_EXPORT kvsvStatus kvsvWriteFrameFlexRay(uint32_t session, SvHandle frames, double timeout);
+
+/* Sends the payloads of the host array of 56-byte Ethernet clusters `frames`; the driver reads
+ * them in place. 0xBFF63001: `frames` is null. 0xBFF63253: a cluster's Reserved field is not 0;
+ * nothing is sent. Otherwise as kvsvWriteFrameCAN, the empty array included. */
+KVSV_EXPORT kvsvStatus kvsvWriteFrameEthernet(uint32_t session, SvHandle frames, double timeout);
+
+/* Hands the bytes of the host byte array `data` (count at byte 0, bytes from byte 4), records
+ * that the program built itself, to the driver as they are. The driver's status. */
+KVSV_EXPORT kvsvStatus kvsvWriteFrameRaw(uint32_t session, SvHandle data, double timeout);
+
 /* ---- Signals ------------------------------------------------------------------------------- */
 
 /* Reads the latest value of every signal of `session` into the host double array `*values`

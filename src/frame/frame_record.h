@@ -40,6 +40,11 @@ inline uint64_t LoadU64(const uint8_t *p) {
   std::memcpy(&v, p, sizeof v);
   return v;
 }
+inline uint16_t LoadU16(const uint8_t *p) {
+  uint16_t v;
+  std::memcpy(&v, p, sizeof v);
+  return v;
+}
 inline uint32_t LoadU32(const uint8_t *p) {
   uint32_t v;
   std::memcpy(&v, p, sizeof v);
