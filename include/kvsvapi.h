@@ -211,6 +211,64 @@ KVSV_EXPORT kvsvStatus kvsvWriteFrameEthernet(uint32_t session, SvHandle frames,
  * that the program built itself, to the driver as they are. The driver's status. */
 KVSV_EXPORT kvsvStatus kvsvWriteFrameRaw(uint32_t session, SvHandle data, double timeout);
 
+/* ---- Frame reads ---------------------------------------------------------------------------
+ * Each read takes at most `numFrames` frames from the driver into the host array `*frames`
+ * (count at byte 0, clusters from byte 8: 32-byte CAN, 32-byte LIN, 40-byte FlexRay or 56-byte
+ * Ethernet), whose Payload elements are host byte arrays (count at byte 0, bytes from byte 4).
+ * `*spareHandles` (count at byte 0, handles from byte 8) keeps the payload handles that the last
+ * read did not fill, for the next one: keep both arrays between calls and a steady read makes no
+ * allocation. Either handle may be null at first; both are created or grown, never shrunk.
+ * A negative `numFrames` asks for every frame the session holds and needs a `timeout` of 0.0.
+ * Any `timeout` but 0.0 (NaN included) lets the host abort the session if the program stops
+ * while the call waits; it goes to the driver as it is.
+ * 0xBFF63020: no such session. 0xBFF63027: the session is in use by another call or closing.
+ * 0xBFF630A0: a negative `numFrames` with a `timeout` other than 0.0. 0xBFF630B0: the host could
+ * not grow an array or make a payload handle. 0xBFF63010: a payload handle could not be resized.
+ * 0xBFF6309F: a payload longer than the session's limit was delivered cut to it.
+ * 0xBFF63015: `frames` or `spareHandles` is null. Otherwise the driver's status, with the frames
+ * it delivered. The Ex forms return 0 at once, touching nothing, when `*skip` is non-zero. */
+
+/* CAN frames, in the session's form: classic, CAN FD up to its payload limit, or J1939 messages
+ * of up to 1785 bytes. 0xBFF63090: a single-point session read for fewer frames than its list. */
+KVSV_EXPORT kvsvStatus kvsvReadFrameCAN(uint32_t session, int32_t numFrames, SvHandle *frames,
+                                        SvHandle *spareHandles, double timeout);
+KVSV_EXPORT kvsvStatus kvsvReadFrameCANEx(uint32_t session, int32_t numFrames, SvHandle *frames,
+                                          SvHandle *spareHandles, const uint8_t *skip,
+                                          double timeout);
+
+/* LIN frames. */
+KVSV_EXPORT kvsvStatus kvsvReadFrameLIN(uint32_t session, int32_t numFrames, SvHandle *frames,
+                                        SvHandle *spareHandles, double timeout);
+KVSV_EXPORT kvsvStatus kvsvReadFrameLINEx(uint32_t session, int32_t numFrames, SvHandle *frames,
+                                          SvHandle *spareHandles, const uint8_t *skip,
+                                          double timeout);
+
+/* FlexRay frames. A session whose payload limit cannot be read returns the driver's status and
+ * answers 0xBFF63027 from then on, until it is aborted or closed. */
+KVSV_EXPORT kvsvStatus kvsvReadFrameFlexRay(uint32_t session, int32_t numFrames,
+                                            SvHandle *frames, SvHandle *spareHandles,
+                                            double timeout);
+KVSV_EXPORT kvsvStatus kvsvReadFrameFlexRayEx(uint32_t session, int32_t numFrames,
+                                              SvHandle *frames, SvHandle *spareHandles,
+                                              const uint8_t *skip, double timeout);
+
+/* Ethernet frames, written by the driver straight into the payload handles. A negative
+ * `numFrames` reads the frames pending now. 0xBFF63001 (instead of 0xBFF63015): `frames` or
+ * `spareHandles` is null. */
+KVSV_EXPORT kvsvStatus kvsvReadFrameEthernet(uint32_t session, int32_t numFrames,
+                                             SvHandle *frames, SvHandle *spareHandles,
+                                             double timeout);
+KVSV_EXPORT kvsvStatus kvsvReadFrameEthernetEx(uint32_t session, int32_t numFrames,
+                                               SvHandle *frames, SvHandle *spareHandles,
+                                               const uint8_t *skip, double timeout);
+
+/* At most `numBytes` bytes of the driver's packed frame records, as they are, into the host byte
+ * array `*data` (count at byte 0, bytes from byte 4), created or grown as needed. A negative
+ * `numBytes` asks for the session's whole capacity and needs a `timeout` of 0.0 (else
+ * 0xBFF630A0). The count is the bytes the driver gave. 0xBFF63015: `data` is null. */
+KVSV_EXPORT kvsvStatus kvsvReadFrameRaw(uint32_t session, int32_t numBytes, SvHandle *data,
+                                        double timeout);
+
 /* ---- Signals ------------------------------------------------------------------------------- */
 
 /* Reads the latest value of every signal of `session` into the host double array `*values`

@@ -29,6 +29,10 @@ constexpr uint32_t kCanIdentifierMask = 0x1FFFFFFFu;
 constexpr uint32_t kLongestLongFrame = 1785;
 constexpr uint32_t kLongestLongRecord = 0x710;
 
+// The record form of a CAN session, learnt at its first read: fixed 24-byte records, variable
+// records up to the session's payload limit, or long J1939 records.
+enum eFrameKind : uint32_t { kFrameKindClassic = 1, kFrameKindFd = 2, kFrameKindJ1939 = 3 };
+
 // Bytes a record of `length` payload bytes takes. A zero length keeps room for eight bytes; the
 // mask is eleven bits wide, so 2041 to 2047 give 16.
 constexpr uint32_t RecordSize(uint32_t length) {

@@ -27,7 +27,7 @@ cSlotGuard::cSlotGuard(uint32_t session, tGuardWord word) : word_(word) {
 }
 
 cSlotGuard::~cSlotGuard() {
-  if (slot_ == nullptr) return;
+  if (slot_ == nullptr || !release_) return;
   std::atomic<uint32_t> &guard = slot_->*word_;
   // An abort on another thread may have freed the guard already.
   if (guard.load(std::memory_order_relaxed) != 0) guard.exchange(0);

@@ -26,11 +26,15 @@ class cSlotGuard : boost::noncopyable {
   Status status() const { return status_; }
   tSessionSlot &slot() const { return *slot_; }
   explicit operator bool() const { return status_ == 0; }
+  // The guard stays held past this object: the slot then answers every call as busy until an
+  // abort or the close frees it.
+  void LeaveHeld() { release_ = false; }
 
  private:
   tSessionSlot *slot_ = nullptr;
   tGuardWord word_;
   Status status_ = 0;
+  bool release_ = true;
 };
 
 }  // namespace nKVSVAPI100
