@@ -141,6 +141,13 @@ int32_t kvGetSubProperty(uint32_t object, uint32_t index, uint32_t id, uint32_t 
 int32_t kvSetSubProperty(uint32_t object, uint32_t index, uint32_t id, uint32_t size,
                          const void *value);
 
+/* State. `size` is the byte size of the value at `value`. */
+enum kvStateId {
+  /* Selects a LIN session's schedule by its 32-bit index. */
+  kvState_LINScheduleChange = 0x130081
+};
+int32_t kvWriteState(uint32_t session, uint32_t stateId, uint32_t size, const void *value);
+
 /* Signals. Buffer sizes are in bytes. */
 int32_t kvReadSignalSinglePoint(uint32_t session, double *values, uint32_t valuesSize,
                                 uint64_t *timestamps, uint32_t timestampsSize);

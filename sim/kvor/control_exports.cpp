@@ -176,6 +176,15 @@ int32_t kvsimBlinkMode(const char *interfaceName) {
   return static_cast<int32_t>(Driver::Instance().Blinking().Get(*index));
 }
 
+int32_t kvsimLinSchedule(uint32_t session, uint32_t *index) {
+  const std::shared_ptr<Session> target = ControlledSession(session);
+  if (!target || index == nullptr) return -1;
+  const std::optional<uint32_t> selected = target->LinSchedule();
+  if (!selected) return 0;
+  *index = *selected;
+  return 1;
+}
+
 int32_t kvsimOpenSessionCount(void) { return CountToInt(Driver::Instance().Sessions().Count()); }
 
 int32_t kvsimOpenSystemCount(void) { return CountToInt(Driver::Instance().Systems().OpenCount()); }

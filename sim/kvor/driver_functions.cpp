@@ -27,6 +27,7 @@ constexpr DriverFunction kFunctions[] = {
     {"kvhdnCreateSvTiming_FlexRayMacrotick", true, false},
     {"kvBlink", true, false},
     {"kvdbCloseDatabase", true, false},
+    {"kvWriteState", true, false},
     {"kvReadFrame", true, false},
     {"kvhdnReadFrame", true, false},
     {"kvWriteFrame", true, false},

@@ -42,6 +42,7 @@ constexpr StatusText kTexts[] = {
      "A terminal name is not valid, or the route joins a terminal to itself."},
     {kvsimErrNotConnected, "The session has not connected these terminals."},
     {kvsimErrInvalidDatabase, "The database handle is invalid, or the database has been closed."},
+    {kvsimErrUnknownState, "The state identifier is not valid."},
     {kvsimErrInvalidFrame,
      "The frame buffer holds a malformed record, or a payload longer than the session allows."},
 

@@ -139,6 +139,10 @@
  *   kvdbCloseDatabase No call opens a database, so every handle is kvsimErrInvalidDatabase.
  *   Error handles     kvBlink and kvdbCloseDatabase also answer an error session, given in place
  *                     of their object, with its status, as the session calls do.
+ *   kvWriteState      Knows one state, kvState_LINScheduleChange, which selects the LIN schedule
+ *                     of a session on a LIN interface (else kvsimErrWrongProtocol): the value is
+ *                     a 4-byte schedule index (another size: kvsimErrInvalidArgument), kept as it
+ *                     is written (kvsimLinSchedule). Any other state is kvsimErrUnknownState.
  */
 #ifndef KVSIM_H
 #define KVSIM_H
@@ -193,6 +197,7 @@ enum kvsimStatus {
                                                      itself */
   kvsimErrNotConnected = (int32_t)0xBFF62051,     /* the session has not connected that route */
   kvsimErrInvalidDatabase = (int32_t)0xBFF62060,  /* not an open database */
+  kvsimErrUnknownState = (int32_t)0xBFF62070,     /* kvWriteState does not know the state */
   kvsimErrInvalidFrame = (int32_t)0xBFF62080      /* a frame write holds a malformed record or a
                                                      payload over the session's maximum */
 };
@@ -288,6 +293,7 @@ KVSIM_API void kvsimClearFailures(void);
  *                            session                    0           0              0
  *   kvBlink                  interface                  0           mode           0
  *   kvdbCloseDatabase        database                   0           closeAll       0
+ *   kvWriteState             session                    state       size           0
  *   kvReadFrame              session                    0           size           0
  *   kvhdnReadFrame           session                    0           size           numFrames
  *   kvWriteFrame             session                    0           size           0
@@ -441,6 +447,13 @@ KVSIM_API int32_t kvsimTerminalConnectionCount(uint32_t session);
 /* The mode of enum kvsimBlinkMode of the interface of that name, or -1 for a name that is not an
  * interface. */
 KVSIM_API int32_t kvsimBlinkMode(const char *interfaceName);
+
+/* ==== LIN schedule ============================================================================ */
+
+/* The schedule index that kvWriteState selected last on the session into *index: 1 if one was
+ * selected, 0 if none was since the session was made, -1 for a session that is not open (error
+ * sessions included) or a null `index`. */
+KVSIM_API int32_t kvsimLinSchedule(uint32_t session, uint32_t *index);
 
 /* ==== Counts ================================================================================= */
 

@@ -7,6 +7,7 @@
 
 #include <atomic>
 #include <cstdint>
+#include <optional>
 #include <utility>
 
 #include "driver_status.h"
@@ -46,6 +47,14 @@ class Session {
   uint64_t FlushedThrough() const { return flushedThrough_.load(); }
   void MarkFlushed(uint64_t publication) { flushedThrough_.store(publication); }
 
+  // The LIN schedule that kvWriteState selected last; none until one is selected.
+  std::optional<uint32_t> LinSchedule() const {
+    const int64_t index = linSchedule_.load();
+    if (index < 0) return std::nullopt;
+    return static_cast<uint32_t>(index);
+  }
+  void SelectLinSchedule(uint32_t index) { linSchedule_.store(index); }
+
  private:
   const SessionDefinition definition_;
   const Status errorStatus_ = 0;
@@ -56,6 +65,7 @@ class Session {
   FrameReadStream readStream_;
   FrameLastWrites lastWrites_;
   std::atomic<uint64_t> flushedThrough_{0};
+  std::atomic<int64_t> linSchedule_{-1};  // -1: no schedule selected
 };
 
 }  // namespace nKvorSim
