@@ -152,7 +152,7 @@ TEST_F(KvorHeldCalls, ClearingTheSessionEndsAParkedControlCallOnIt) {
 }
 
 TEST_F(KvorHeldCalls, OnlyDriverFunctionsCanBeHeld) {
-  EXPECT_EQ(kvsimHold("kvReadFrame"), -1) << "not a function of this driver";
+  EXPECT_EQ(kvsimHold("kvNoSuchCall"), -1) << "not a function of this driver";
   EXPECT_EQ(kvsimHold(nullptr), -1);
   EXPECT_EQ(kvsimRelease("kvsimReset"), -1);
   EXPECT_EQ(kvsimHold("kvStatusToString"), 0);

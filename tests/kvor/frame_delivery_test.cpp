@@ -1,0 +1,247 @@
+// Frames travel from output sessions to the input sessions of the same network, with the clock's
+// time, as echoes on the writer's own interface, and in the record form of the reading session.
+#include <string>
+
+#include "frame_test_support.h"
+
+namespace {
+
+using KvorFrameDelivery = KvorTest;
+
+constexpr uint64_t kNoon = 133600000000000000ull;  // a raw time in 2024
+
+TEST_F(KvorFrameDelivery, EveryJoinedPairCarriesFramesToTheOtherEndOnly) {
+  struct Case {
+    const char *from;
+    const char *to;
+    const char *bystander;  // another network
+    Rec sent;
+  };
+  const Case cases[] = {
+      {"CAN1", "CAN2", "CAN3", {0x20000123, {0xDE, 0xAD, 0xBE}, 0x05, 0x00, 0x00}},
+      {"CAN2", "CAN1", "LIN1", {0x7FF, Pattern(8, 1), 0x00, 0x00, 0x00}},
+      {"CAN4", "CAN3", "CAN1", {0x18FEF100, {}, 0x11, 0x00, 0x00}},
+      {"LIN1", "LIN2", "CAN2", {0x3C, {1, 2}, 0x02, 0x01, 0x9A}},
+      {"FlexRay2", "FlexRay1", "ENET1", {0x7F, Pattern(254, 9), 0x03, 0x37, 0x42}},
+  };
+  for (const Case &c : cases) {
+    SCOPED_TRACE(std::string(c.from) + " -> " + c.to);
+    kvsimReset();
+    const uint32_t writer = Create(c.from, kvMode_FrameOutStream);
+    const uint32_t reader = Create(c.to, kvMode_FrameInStream);
+    const uint32_t own = Create(c.from, kvMode_FrameInQueued);
+    const uint32_t other = Create(c.bystander, kvMode_FrameInStream);
+    kvsimSetClock(kNoon);
+    Rec written = c.sent;
+    written.timestamp = 77;  // the driver stamps frames itself
+    const std::vector<uint8_t> bytes = Pack({written});  // up to 8 bytes both forms agree
+    ASSERT_EQ(kvWriteFrame(writer, bytes.data(), static_cast<uint32_t>(bytes.size()), 0.0), 0);
+    Rec expected = c.sent;
+    expected.timestamp = kNoon;
+    EXPECT_EQ(Drain(reader), std::vector<Rec>{expected});
+    EXPECT_TRUE(Drain(own).empty()) << "no echo unless asked for";
+    if (std::string(c.bystander) != "ENET1") {
+      EXPECT_TRUE(Drain(other).empty()) << "another network hears nothing";
+    }
+  }
+}
+
+TEST_F(KvorFrameDelivery, AnEchoReachesTheWritersOwnInterfaceMarked) {
+  const uint32_t writer = Create("CAN1", kvMode_FrameOutQueued);
+  const uint32_t own = Create("CAN1", kvMode_FrameInStream);
+  const uint32_t far = Create("CAN2", kvMode_FrameInStream);
+  SetEcho(writer);
+  kvsimSetClock(kNoon + 5);
+  const std::vector<uint8_t> bytes = Pack({{0x100, {7}, 0, 0x80}}, true);
+  ASSERT_EQ(kvWriteFrame(writer, bytes.data(), 24, 0.0), 0);
+  EXPECT_EQ(Drain(own), (std::vector<Rec>{{0x100, {7}, 0, 0x80, 0, kNoon + 5}}));
+  EXPECT_EQ(Drain(far), (std::vector<Rec>{{0x100, {7}, 0, 0x00, 0, kNoon + 5}}))
+      << "a written echo flag does not travel";
+}
+
+TEST_F(KvorFrameDelivery, Enet1HearsItselfThroughDescriptors) {
+  const uint32_t writer = Create("ENET1", kvMode_FrameOutStream);
+  const uint32_t first = Create("ENET1/a", kvMode_FrameInStream);
+  const uint32_t second = Create("ENET1/b", kvMode_FrameInQueued);
+  const std::vector<uint8_t> jumbo = Pattern(1500, 3);
+  const uint8_t tiny[] = {0xAB};
+  const EthernetOut frames[] = {Out(jumbo.data(), 1500), Out(nullptr, 0), Out(tiny, 1)};
+  kvsimSetClock(116444736000000000ull + 42);  // 1970 plus 4200 ns
+  ASSERT_EQ(kvhdnWriteFrameEthernet(writer, frames, 2, 0.0), 0);
+  SetEcho(writer);
+  kvsimAdvanceClock(10);
+  ASSERT_EQ(kvhdnWriteFrameEthernet(writer, frames + 2, 1, 0.0), 0);
+
+  for (uint32_t reader : {first, second}) {
+    std::vector<uint8_t> room(3 * 2000, 0xEE);
+    EthernetSlot slots[4] = {Room(room.data(), 1500), Room(room.data() + 2000, 64),
+                             Room(room.data() + 4000, 0),  // no room: cut to nothing
+                             Room(room.data() + 4000, 64)};
+    int32_t returned = -1;
+    ASSERT_EQ(kvhdnReadFrameEthernet(reader, slots, 4, &returned, 0.0), 0);
+    ASSERT_EQ(returned, 3);
+    EXPECT_EQ(std::vector<uint8_t>(room.begin(), room.begin() + 1500), jumbo);
+    struct Expected {
+      uint32_t length, flags, wireLength, word;
+      uint64_t time;
+    };
+    const Expected expected[] = {{1500, 0x0, 1500, 1, 4200}, {0, 0x0, 0, 2, 4200},
+                                 {0, 0x9, 1, 3, 5200}};
+    for (int i = 0; i < 3; ++i) {
+      SCOPED_TRACE(i);
+      EXPECT_EQ(slots[i].length, expected[i].length);
+      EXPECT_EQ(slots[i].flags, expected[i].flags) << "bit 0 echo, bit 3 cut";
+      EXPECT_EQ(slots[i].wireLength, expected[i].wireLength);
+      EXPECT_EQ(slots[i].word, expected[i].word) << "numbered on the network";
+      EXPECT_EQ(slots[i].firstTime, expected[i].time) << "1 ns since 1970";
+      EXPECT_EQ(slots[i].secondTime, expected[i].time);
+    }
+    EXPECT_EQ(room[4000], 0xEE) << "nothing stored without room";
+  }
+}
+
+TEST_F(KvorFrameDelivery, TheReadersFormDecidesTheRecordSizes) {
+  struct Case {
+    const char *name;
+    const char *from;
+    const char *to;
+    uint32_t canIoMode;
+    uint32_t application;
+    bool fixed;
+    std::vector<uint32_t> lengths;
+    std::vector<uint32_t> sizes;  // of each record that kvReadFrame gives
+  };
+  const Case cases[] = {
+      {"classic CAN", "CAN1", "CAN2", 0, 0, true, {0, 3, 8}, {24, 24, 24}},
+      {"LIN", "LIN2", "LIN1", 0, 0, true, {8, 1}, {24, 24}},
+      {"CAN FD", "CAN3", "CAN4", 1, 0, false, {12, 16, 20, 24, 32, 48, 64, 0},
+       {32, 32, 40, 40, 48, 64, 80, 24}},
+      {"J1939", "CAN2", "CAN1", 0, 1, false, {1785, 256, 255, 8}, {1808, 272, 272, 24}},
+      {"FlexRay", "FlexRay1", "FlexRay2", 0, 0, false, {254, 17, 0}, {272, 40, 24}},
+  };
+  for (const Case &c : cases) {
+    SCOPED_TRACE(c.name);
+    kvsimReset();
+    const uint32_t writer = Create(c.from, kvMode_FrameOutQueued);
+    const uint32_t reader = Create(c.to, kvMode_FrameInQueued);
+    std::vector<Rec> sent;
+    for (uint32_t length : c.lengths) {
+      Rec r{0x600u + length, Pattern(length, static_cast<uint8_t>(length))};
+      if (length > 255) r.type = 0xC0;
+      sent.push_back(r);
+    }
+    for (uint32_t session : {writer, reader}) {
+      SetU32(session, kvPropSession_IntfCanIoMode, c.canIoMode);
+      SetU32(session, kvPropSession_ApplicationProtocol, c.application);
+    }
+    const std::vector<uint8_t> bytes = Pack(sent, c.fixed);
+    ASSERT_EQ(kvWriteFrame(writer, bytes.data(), static_cast<uint32_t>(bytes.size()), 0.0), 0);
+    std::vector<uint8_t> buffer(8192);
+    uint32_t got = 0;
+    ASSERT_EQ(kvReadFrame(reader, buffer.data(), 8192, 0.0, &got), 0);
+    uint32_t total = 0;
+    for (uint32_t size : c.sizes) total += size;
+    EXPECT_EQ(got, total);
+    const std::vector<Rec> read = Unpack(buffer.data(), got, c.fixed);
+    ASSERT_EQ(read.size(), sent.size());
+    for (size_t i = 0; i < sent.size(); ++i) {
+      EXPECT_EQ(read[i].payload, sent[i].payload) << i;
+      EXPECT_EQ(read[i].type, sent[i].type) << i;
+    }
+  }
+}
+
+TEST_F(KvorFrameDelivery, ALongJ1939RecordKeepsItsLengthInInfo) {
+  const uint32_t writer = Create("CAN1", kvMode_FrameOutStream);
+  const uint32_t reader = Create("CAN2", kvMode_FrameInStream);
+  for (uint32_t session : {writer, reader}) {
+    SetU32(session, kvPropSession_ApplicationProtocol, 1);
+  }
+  const std::vector<uint8_t> bytes = Pack({{0x38FEF100, Pattern(1785, 4), 0xC0, 0, 0x18}});
+  ASSERT_EQ(bytes.size(), 1808u);
+  ASSERT_EQ(kvWriteFrame(writer, bytes.data(), 1808, 0.0), 0);
+  uint8_t buffer[1808];
+  uint32_t got = 0;
+  ASSERT_EQ(kvReadFrame(reader, buffer, sizeof buffer, 0.0, &got), 0);
+  ASSERT_EQ(got, 1808u);
+  EXPECT_EQ(buffer[12], 0xC0);
+  EXPECT_EQ(buffer[14], 0x18 | 6) << "1785 is 0x6F9: the high bits in Info";
+  EXPECT_EQ(buffer[15], 0xF9);
+  EXPECT_EQ(std::vector<uint8_t>(buffer + 16, buffer + 16 + 1785), Pattern(1785, 4));
+}
+
+TEST_F(KvorFrameDelivery, ASinglePointSessionGivesTheLatestFrameOfEachItem) {
+  const uint32_t writer = Create("CAN3", kvMode_FrameOutSinglePoint);
+  const uint32_t reader =
+      Create("CAN4", kvMode_FrameInSinglePoint, "0x123, 0x18FEF100x:4, 0x7FF:2");
+  const std::vector<Rec> never = {{0x123, std::vector<uint8_t>(8)},
+                                  {0x38FEF100, std::vector<uint8_t>(4)},
+                                  {0x7FF, std::vector<uint8_t>(2)}};
+  EXPECT_EQ(Drain(reader), never) << "time 0, zeros of the item's length";
+
+  const auto send = [&](Rec r) {
+    const std::vector<uint8_t> bytes = Pack({r}, true);
+    ASSERT_EQ(kvWriteFrame(writer, bytes.data(), 24, 0.0), 0);
+  };
+  kvsimSetClock(kNoon);
+  send({0x123, {1}});
+  send({0x38FEF100, {2, 2}});
+  kvsimAdvanceClock(100);
+  send({0x123, {3, 3, 3}});
+  send({0x18FEF100, {9}});  // standard-form twin of an extended item
+  send({0x124, {9}});
+  const std::vector<Rec> latest = {
+      {0x123, {3, 3, 3}, 0, 0, 0, kNoon + 100}, {0x38FEF100, {2, 2}, 0, 0, 0, kNoon}, never[2]};
+  EXPECT_EQ(Drain(reader), latest);
+  EXPECT_EQ(Drain(reader), latest) << "reading does not use them up";
+
+  uint8_t two[48];
+  uint32_t got = 0;
+  ASSERT_EQ(kvhdnReadFrame(reader, two, sizeof two, 1, 0.0, &got), 0);
+  EXPECT_EQ(got, 24u) << "at most numFrames records";
+  ASSERT_EQ(kvFlush(reader), 0);
+  EXPECT_EQ(Drain(reader), never);
+}
+
+TEST_F(KvorFrameDelivery, FrameSessionsHaveTheirPropertiesBeforeAnyIsSet) {
+  struct Case {
+    const char *interfaceName;
+    uint32_t canIoMode;
+    uint32_t application;
+    uint32_t payloadMax;
+  };
+  const Case cases[] = {{"CAN1", 0, 0, 8},   {"CAN1", 1, 0, 64},    {"CAN2", 1, 1, 1785},
+                        {"LIN2", 0, 0, 8},   {"FlexRay1", 0, 0, 254}, {"ENET1", 0, 0, 1500}};
+  for (const Case &c : cases) {
+    SCOPED_TRACE(c.interfaceName);
+    const uint32_t session = Create(c.interfaceName, kvMode_FrameInQueued, "0x10:5,0x11");
+    if (c.canIoMode != 0) SetU32(session, kvPropSession_IntfCanIoMode, c.canIoMode);
+    if (c.application != 0) SetU32(session, kvPropSession_ApplicationProtocol, c.application);
+    EXPECT_EQ(ReadU32(session, kvPropSession_PayldLenMax), c.payloadMax);
+    const uint32_t record = c.payloadMax <= 8 ? 24 : 16 + (c.payloadMax + 7) / 8 * 8;
+    EXPECT_EQ(ReadU32(session, kvPropSession_QueueSize), 4096 * record);
+    uint32_t length = 0;
+    ASSERT_EQ(kvGetSubProperty(session, 0, kvPropHidden_FramePayloadLen, 4, &length), 0);
+    EXPECT_EQ(length, 5u);
+    ASSERT_EQ(kvGetSubProperty(session, 1, kvPropHidden_FramePayloadLen, 4, &length), 0);
+    EXPECT_EQ(length, c.payloadMax) << "an item without a length has the maximum";
+    EXPECT_EQ(kvGetSubProperty(session, 2, kvPropHidden_FramePayloadLen, 4, &length),
+              kvsimErrInvalidSubIndex);
+    EXPECT_EQ(ReadU32(session, kvPropSession_NumPend), 0u);
+    uint8_t echo = 9;
+    ASSERT_EQ(kvGetProperty(session, kvPropSession_IntfEchoTx, 1, &echo), 0);
+    EXPECT_EQ(echo, 0);
+  }
+  const uint32_t session = Create("CAN1", kvMode_FrameInStream);
+  SetU32(session, kvPropSession_PayldLenMax, 20);
+  EXPECT_EQ(ReadU32(session, kvPropSession_PayldLenMax), 20u) << "a set value wins";
+  EXPECT_EQ(ReadU32(session, kvPropSession_QueueSize), 4096u * 40);
+  const uint32_t pending = 3;
+  EXPECT_EQ(kvSetProperty(session, kvPropSession_NumPend, 4, &pending), kvsimErrPropertyReadOnly);
+  const uint32_t signals = Create("CAN1", kvMode_SignalInSinglePoint, "Speed");
+  uint32_t size = 0;
+  EXPECT_EQ(kvGetPropertySize(signals, kvPropSession_PayldLenMax, &size), kvsimErrPropertyUnknown)
+      << "only frame sessions have frame defaults";
+}
+
+}  // namespace
