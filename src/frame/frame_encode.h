@@ -6,16 +6,17 @@
 #include <cstdint>
 
 #include "core/status.h"
+#include "frame/frame_record.h"
 
 namespace nKVSVAPI100 {
 
-// How a cluster becomes a record. The first three are the frameKind values of a CAN session.
+// How a cluster becomes a record. A CAN session's frameKind names its encoding.
 enum eRecordEncoding : uint32_t {
-  kEncodeCanFixed = 1,     // classic CAN: 24-byte records
-  kEncodeCanFlexible = 2,  // CAN FD: each record its own size
-  kEncodeJ1939 = 3,        // as CAN FD, with messages above 255 bytes in the 0xC0 long form
-  kEncodeLin = 4,          // 24-byte records, Flag0 and Info
-  kEncodeFlexRay = 5       // records of their own size, flags and Info from the cluster
+  kEncodeCanFixed = kFrameKindClassic,  // 24-byte records
+  kEncodeCanFlexible = kFrameKindFd,    // each record its own size
+  kEncodeJ1939 = kFrameKindJ1939,       // as CAN FD, messages above 255 bytes in the 0xC0 long form
+  kEncodeLin = 4,                       // 24-byte records, Info only under Flag0
+  kEncodeFlexRay = 5                    // each record its own size, five flags
 };
 
 struct tRecordEncoded {

@@ -42,7 +42,8 @@ Status ExtendFrameBuffer(tSessionSlot &slot, uint64_t size) {
   if (size <= slot.frameBufferSize) return 0;
   if (size > kLargestBuffer) return NoBuffer(slot);
   // Doubling keeps a walk that outgrows the buffer record after record from copying each time.
-  const uint64_t grown = std::min(std::max(size, uint64_t{slot.frameBufferSize} * 2), kLargestBuffer);
+  const uint64_t grown =
+      std::min(std::max(size, uint64_t{slot.frameBufferSize} * 2), kLargestBuffer);
   void *block = std::realloc(slot.frameBuffer, grown);
   if (block == nullptr) return NoBuffer(slot);
   slot.frameBuffer = block;

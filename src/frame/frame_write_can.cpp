@@ -21,14 +21,14 @@ constexpr uint32_t kApplicationProtocolJ1939 = 1;
 Status SetUpCanWrite(tSessionSlot &slot, uint32_t session, int32_t count) {
   // A failed read of the mode or of the protocol is no error: the session is taken as classic.
   uint32_t ioMode = 0;
-  const bool flexible = kvGetProperty(session, kvPropSession_IntfCanIoMode, 4, &ioMode) >= 0 &&
-                        ioMode != 0;
-  slot.frameKind = flexible ? kEncodeCanFlexible : kEncodeCanFixed;
+  const bool flexible =
+      kvGetProperty(session, kvPropSession_IntfCanIoMode, 4, &ioMode) >= 0 && ioMode != 0;
+  slot.frameKind = flexible ? kFrameKindFd : kFrameKindClassic;
   const Status status = ReadPayloadLimit(slot, session);
   uint32_t protocol = 0;
   if (kvGetProperty(session, kvPropSession_ApplicationProtocol, 4, &protocol) >= 0 &&
       protocol == kApplicationProtocolJ1939)
-    slot.frameKind = kEncodeJ1939;
+    slot.frameKind = kFrameKindJ1939;
   return SizeRecordBuffer(slot, count, status);
 }
 
@@ -59,10 +59,10 @@ extern "C" KVSV_EXPORT kvsvStatus kvsvWriteFrameCAN(uint32_t session, SvHandle f
   tSessionSlot &slot = guard.slot();
   Status status = 0;
   if (count > slot.cachedCount) status = SetUpCanWrite(slot, session, count);
-  if (status >= 0 && slot.frameKind == kEncodeJ1939)
+  if (status >= 0 && slot.frameKind == kFrameKindJ1939)
     status = MakeRoomForLongMessages(slot, frames, count);
   if (status < 0) return status;
-  if (slot.frameKind < kEncodeCanFixed || slot.frameKind > kEncodeJ1939)
+  if (slot.frameKind < kFrameKindClassic || slot.frameKind > kFrameKindJ1939)
     return SendFrameRecords(session, slot.frameBuffer, 0, timeout);
   return EncodeAndSendRecords(slot, session, frames, count, tFrameClusterCAN::kSize,
                               static_cast<eRecordEncoding>(slot.frameKind), timeout);
