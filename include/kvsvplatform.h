@@ -123,8 +123,36 @@ int32_t kvhdnReadFrameEthernet(uint32_t session, void *descriptors, uint32_t num
 int32_t kvhdnWriteFrameEthernet(uint32_t session, const void *descriptors, uint32_t numFrames,
                                 double timeout);
 
-/* Databases. */
+/* Databases. A database is opened by alias, by the path of a database file, or as ":memory:";
+ * its objects (cluster, frame, signal, ECU, PDU) are found or created under a parent by class
+ * (the class codes of the property identifiers: 0x10000 cluster, 0x20000 frame, 0x30000 signal,
+ * 0x50000 ECU, 0x80000 PDU) and name. A signal is found in its frame by name, or in its cluster
+ * as "frame.signal" or by a name that no other frame uses. Every handle of a database, its own
+ * or an object's, serves kvdbCloseDatabase: closeAll 0 undoes one open, 1 every open. */
+int32_t kvdbOpenDatabase(const char *name, uint32_t *database);
 int32_t kvdbCloseDatabase(uint32_t database, uint32_t closeAll);
+int32_t kvdbFindObject(uint32_t parent, uint32_t objectClass, const char *name, uint32_t *object);
+int32_t kvdbCreateObject(uint32_t parent, uint32_t objectClass, const char *name,
+                         uint32_t *object);
+/* Deletes a cluster, frame (with its signals and PDU), signal or ECU. */
+int32_t kvdbDeleteObject(uint32_t object);
+/* Properties of database objects; the identifier's class must be the object's. */
+int32_t kvdbGetPropertySize(uint32_t object, uint32_t id, uint32_t *size);
+int32_t kvdbGetProperty(uint32_t object, uint32_t id, uint32_t size, void *value);
+int32_t kvdbSetProperty(uint32_t object, uint32_t id, uint32_t size, const void *value);
+/* Writes the database as a database file at `filePath`, or, if it is null or empty, to the file
+ * it was opened from. */
+int32_t kvdbSaveDatabase(uint32_t database, const char *filePath);
+/* Names a database file by an alias; the baud rate serves a file that gives none. */
+int32_t kvdbAddAlias(const char *alias, const char *filePath, uint32_t defaultBaudRate);
+int32_t kvdbAddAlias64(const char *alias, const char *filePath, uint64_t defaultBaudRate);
+int32_t kvdbRemoveAlias(const char *alias);
+/* The aliases and their file paths, as two comma-separated lists in the same order. Sizes count
+ * the NUL. `target` 0 is this machine. A list that outgrew the sizes given is
+ * kvErrDatabaseListChanged. */
+int32_t kvdbGetDatabaseListSizes(uint64_t target, uint32_t *aliasesSize, uint32_t *pathsSize);
+int32_t kvdbGetDatabaseList(uint64_t target, uint32_t aliasesSize, char *aliases,
+                           uint32_t pathsSize, char *paths, uint32_t *count);
 
 /* Status text. */
 void kvStatusToString(int32_t status, uint32_t size, char *text);

@@ -1,11 +1,502 @@
 #include "database_registry.h"
 
+#include <cstring>
+
+#include "database_files.h"
+#include "database_properties.h"
 #include "kvsim.h"
+#include "kvsvapi.h"
 
 namespace nKvorSim {
 
-// The stand-in has no database engine, so no call opens a database and no handle names an open
-// one: every close is refused.
-Status DatabaseRegistry::Close(uint32_t, uint32_t) { return kvsimErrInvalidDatabase; }
+namespace {
+
+constexpr uint64_t kDefaultBaudRate = 500000;
+constexpr uint32_t kHandleTag = 0x80000000u;
+constexpr uint32_t kNumberMask = 0x00FFFFFFu;
+
+tObjectRef WithClass(const tObjectRef &from, uint32_t objectClass) {
+  tObjectRef ref = from;
+  ref.objectClass = objectClass;
+  return ref;
+}
+
+template <class List>
+auto *FindNamed(List &list, const std::string &name) {
+  for (auto &item : list) {
+    if (item.name == name) return &item;
+  }
+  return static_cast<typename List::value_type *>(nullptr);
+}
+
+template <class List, class Item>
+void EraseItem(List &list, const Item *item) {
+  for (auto it = list.begin(); it != list.end(); ++it) {
+    if (&*it == item) {
+      list.erase(it);
+      return;
+    }
+  }
+}
+
+tObjectRef ClusterRefOf(const tObjectRef &database, tCluster *cluster) {
+  tObjectRef ref;
+  ref.objectClass = kClassCluster;
+  ref.database = database.database;
+  ref.cluster = cluster;
+  return ref;
+}
+
+}  // namespace
+
+class DatabaseRegistry::cHandleSource final : public iObjectHandles {
+ public:
+  cHandleSource(DatabaseRegistry &registry, tLoaded *loaded)
+      : registry_(registry), loaded_(loaded) {}
+  uint32_t HandleOf(const tObjectRef &ref) override { return registry_.HandleOf(loaded_, ref); }
+
+ private:
+  DatabaseRegistry &registry_;
+  tLoaded *loaded_;
+};
+
+DatabaseRegistry::DatabaseRegistry() = default;
+DatabaseRegistry::~DatabaseRegistry() = default;
+
+Status DatabaseRegistry::Fail(Status status, std::string text) {
+  errorText_ = std::move(text);
+  return status;
+}
+
+DatabaseRegistry::tEntry *DatabaseRegistry::Resolve(uint32_t handle) {
+  const auto found = handles_.find(handle);
+  return found == handles_.end() ? nullptr : &found->second;
+}
+
+uint32_t DatabaseRegistry::HandleOf(tLoaded *loaded, const tObjectRef &ref) {
+  const std::pair<uint32_t, const void *> key{ref.objectClass, ObjectOf(ref)};
+  const auto known = byObject_.find(key);
+  if (known != byObject_.end()) return known->second;
+  const uint32_t classBits = (ref.objectClass >> 16) << 24;
+  uint32_t handle;
+  do {
+    lastNumber_ = lastNumber_ % kNumberMask + 1;
+    handle = kHandleTag | classBits | lastNumber_;
+  } while (handles_.count(handle) != 0);
+  handles_.emplace(handle, tEntry{loaded, ref});
+  byObject_.emplace(key, handle);
+  return handle;
+}
+
+void DatabaseRegistry::DropHandles(const std::function<bool(const tEntry &)> &doomed) {
+  for (auto it = handles_.begin(); it != handles_.end();) {
+    if (doomed(it->second)) {
+      byObject_.erase({it->second.ref.objectClass, ObjectOf(it->second.ref)});
+      it = handles_.erase(it);
+    } else {
+      ++it;
+    }
+  }
+}
+
+void DatabaseRegistry::Unload(tLoaded *loaded) {
+  DropHandles([&](const tEntry &entry) { return entry.loaded == loaded; });
+  loaded_.erase(loaded->key);
+}
+
+Status DatabaseRegistry::LocateFile(const std::string &name, std::string *canonical,
+                                    uint64_t *aliasBaudRate) {
+  *aliasBaudRate = 0;
+  std::string path = DatabasePath(name);
+  if (const std::optional<tAlias> alias = aliases_.Find(name)) {
+    path = alias->path;
+    *aliasBaudRate = alias->baudRate;
+  }
+  *canonical = CanonicalPath(path);
+  if (canonical->empty()) {
+    return Fail(kvsimErrDatabaseNotFound, name + ": no alias, and no file at " + path);
+  }
+  return 0;
+}
+
+Status DatabaseRegistry::LoadFile(const std::string &path, const std::string &name,
+                                  uint64_t aliasBaudRate, tDatabase *model) {
+  std::string error;
+  const Status status = LoadDatabaseFile(path, name, model, &error);
+  if (status != 0) return Fail(status, error);
+  // A file that gives no baud rate takes its alias's, else the usual one.
+  for (tCluster &cluster : model->clusters) {
+    if (cluster.baudRate == 0) cluster.baudRate = aliasBaudRate != 0 ? aliasBaudRate : kDefaultBaudRate;
+  }
+  return 0;
+}
+
+Status DatabaseRegistry::Open(const char *name, uint32_t *handle) {
+  if (name == nullptr || handle == nullptr) return kvsimErrNullPointer;
+  std::lock_guard<std::mutex> lock(mutex_);
+  const std::string text = name;
+  if (text.empty()) return Fail(kvsimErrDatabaseNotFound, "the database name is empty");
+  std::string key = text;
+  uint64_t aliasBaudRate = 0;
+  if (text != kMemoryName) {
+    const Status located = LocateFile(text, &key, &aliasBaudRate);
+    if (located != 0) return located;
+  }
+  const auto open = loaded_.find(key);
+  if (open != loaded_.end()) {
+    ++open->second->opens;
+    *handle = open->second->handle;
+    return 0;
+  }
+  auto loaded = std::make_unique<tLoaded>();
+  loaded->key = key;
+  if (text != kMemoryName) {
+    loaded->path = key;
+    const Status status = LoadFile(key, text, aliasBaudRate, &loaded->model);
+    if (status != 0) return status;
+  }
+  loaded->model.name = text;
+  loaded->opens = 1;
+  tObjectRef ref;
+  ref.database = &loaded->model;
+  tLoaded *raw = loaded.get();
+  loaded_.emplace(key, std::move(loaded));
+  *handle = raw->handle = HandleOf(raw, ref);
+  return 0;
+}
+
+Status DatabaseRegistry::Close(uint32_t handle, uint32_t closeAll) {
+  std::lock_guard<std::mutex> lock(mutex_);
+  tEntry *entry = Resolve(handle);
+  if (entry == nullptr) return kvsimErrInvalidDatabase;
+  tLoaded *loaded = entry->loaded;
+  if (closeAll != 0 || --loaded->opens == 0) Unload(loaded);
+  return 0;
+}
+
+Status DatabaseRegistry::Find(const tObjectRef &parent, uint32_t objectClass,
+                              const std::string &name, tObjectRef *found) {
+  switch (parent.objectClass) {
+    case kClassDatabase: {
+      std::list<tCluster> &clusters = parent.database->clusters;
+      if (objectClass != kClassCluster) {
+        // A database of one cluster stands for it.
+        if (clusters.size() != 1) return kvsimErrInvalidClass;
+        return Find(ClusterRefOf(parent, &clusters.front()), objectClass, name, found);
+      }
+      tCluster *cluster = name.empty() && !clusters.empty() ? &clusters.front()
+                                                            : FindNamed(clusters, name);
+      if (cluster == nullptr) return kvsimErrObjectNotFound;
+      *found = ClusterRefOf(parent, cluster);
+      return 0;
+    }
+    case kClassCluster: {
+      if (objectClass == kClassEcu) {
+        tEcu *ecu = FindNamed(parent.cluster->ecus, name);
+        if (ecu == nullptr) return kvsimErrObjectNotFound;
+        *found = WithClass(parent, kClassEcu);
+        found->ecu = ecu;
+        return 0;
+      }
+      if (objectClass == kClassFrame || objectClass == kClassPdu) {
+        tFrame *frame = FindNamed(parent.cluster->frames, name);
+        if (frame == nullptr) return kvsimErrObjectNotFound;
+        *found = WithClass(parent, objectClass);
+        found->frame = frame;
+        return 0;
+      }
+      if (objectClass != kClassSignal) return kvsimErrInvalidClass;
+      const size_t dot = name.find('.');
+      if (dot != std::string::npos) {
+        tFrame *frame = FindNamed(parent.cluster->frames, name.substr(0, dot));
+        if (frame == nullptr) return kvsimErrObjectNotFound;
+        tObjectRef frameRef = WithClass(parent, kClassFrame);
+        frameRef.frame = frame;
+        return Find(frameRef, kClassSignal, name.substr(dot + 1), found);
+      }
+      // A bare signal name must be unique in the cluster.
+      bool seen = false;
+      for (tFrame &frame : parent.cluster->frames) {
+        tSignal *signal = FindNamed(frame.signals, name);
+        if (signal == nullptr) continue;
+        if (seen) {
+          return Fail(kvsimErrObjectNotFound,
+                      "signal '" + name + "' is in more than one frame: name it with its frame");
+        }
+        seen = true;
+        *found = WithClass(parent, kClassSignal);
+        found->frame = &frame;
+        found->signal = signal;
+      }
+      return seen ? 0 : kvsimErrObjectNotFound;
+    }
+    case kClassFrame:
+    case kClassPdu: {
+      if (objectClass != kClassSignal) return kvsimErrInvalidClass;
+      tSignal *signal = FindNamed(parent.frame->signals, name);
+      if (signal == nullptr) return kvsimErrObjectNotFound;
+      *found = WithClass(parent, kClassSignal);
+      found->signal = signal;
+      return 0;
+    }
+    default:
+      return kvsimErrInvalidClass;
+  }
+}
+
+Status DatabaseRegistry::FindObject(uint32_t parent, uint32_t objectClass, const char *name,
+                                    uint32_t *object) {
+  if (name == nullptr || object == nullptr) return kvsimErrNullPointer;
+  std::lock_guard<std::mutex> lock(mutex_);
+  tEntry *entry = Resolve(parent);
+  if (entry == nullptr) return kvsimErrInvalidDatabase;
+  tObjectRef found;
+  const Status status = Find(entry->ref, objectClass, name, &found);
+  if (status != 0) return status;
+  *object = HandleOf(entry->loaded, found);
+  return 0;
+}
+
+Status DatabaseRegistry::CreateObject(uint32_t parent, uint32_t objectClass, const char *name,
+                                      uint32_t *object) {
+  if (name == nullptr || object == nullptr) return kvsimErrNullPointer;
+  std::lock_guard<std::mutex> lock(mutex_);
+  tEntry *entry = Resolve(parent);
+  if (entry == nullptr) return kvsimErrInvalidDatabase;
+  const std::string text = name;
+  if (!IsIdentifier(text)) return kvsimErrInvalidName;
+  const tObjectRef &at = entry->ref;
+  tObjectRef made = WithClass(at, objectClass);
+  if (at.objectClass == kClassDatabase && objectClass == kClassCluster) {
+    // A database file holds one cluster.
+    if (!at.database->clusters.empty()) return kvsimErrObjectExists;
+    made.cluster = &at.database->clusters.emplace_back();
+    made.cluster->name = text;
+    made.cluster->baudRate = kDefaultBaudRate;
+  } else if (at.objectClass == kClassCluster && objectClass == kClassEcu) {
+    if (FindNamed(at.cluster->ecus, text) != nullptr) return kvsimErrObjectExists;
+    made.ecu = &at.cluster->ecus.emplace_back(tEcu{text, {}});
+  } else if (at.objectClass == kClassCluster && objectClass == kClassFrame) {
+    if (FindNamed(at.cluster->frames, text) != nullptr) return kvsimErrObjectExists;
+    // The lowest identifier that is free, standard before extended.
+    tFrame frame;
+    frame.name = text;
+    for (bool free = false; !free;) {
+      free = true;
+      for (const tFrame &other : at.cluster->frames) {
+        if (other.id == frame.id && other.extended == frame.extended) free = false;
+      }
+      if (free) break;
+      if (frame.id == MaxFrameId(frame.extended)) {
+        if (frame.extended) return kvsimErrObjectExists;
+        frame.extended = true;
+        frame.id = 0;
+      } else {
+        ++frame.id;
+      }
+    }
+    made.frame = &at.cluster->frames.emplace_back(std::move(frame));
+  } else if (at.objectClass == kClassFrame && objectClass == kClassSignal) {
+    if (FindNamed(at.frame->signals, text) != nullptr) return kvsimErrObjectExists;
+    tSignal signal;
+    signal.name = text;
+    made.signal = &at.frame->signals.emplace_back(std::move(signal));
+  } else {
+    return kvsimErrInvalidClass;
+  }
+  *object = HandleOf(entry->loaded, made);
+  return 0;
+}
+
+Status DatabaseRegistry::DeleteObject(uint32_t object) {
+  std::lock_guard<std::mutex> lock(mutex_);
+  tEntry *entry = Resolve(object);
+  if (entry == nullptr) return kvsimErrInvalidDatabase;
+  const tObjectRef ref = entry->ref;
+  switch (ref.objectClass) {
+    case kClassCluster:
+      DropHandles([&](const tEntry &e) { return e.ref.cluster == ref.cluster; });
+      EraseItem(ref.database->clusters, ref.cluster);
+      return 0;
+    case kClassFrame:
+      DropHandles([&](const tEntry &e) { return e.ref.frame == ref.frame; });
+      EraseItem(ref.cluster->frames, ref.frame);
+      return 0;
+    case kClassSignal:
+      DropHandles([&](const tEntry &e) { return e.ref.signal == ref.signal; });
+      EraseItem(ref.frame->signals, ref.signal);
+      return 0;
+    case kClassEcu: {
+      const std::string name = ref.ecu->name;
+      for (tFrame &frame : ref.cluster->frames) {
+        if (frame.transmitter == name) frame.transmitter.clear();
+        for (tSignal &signal : frame.signals) {
+          auto &receivers = signal.receivers;
+          for (auto it = receivers.begin(); it != receivers.end();) {
+            it = *it == name ? receivers.erase(it) : it + 1;
+          }
+        }
+      }
+      DropHandles([&](const tEntry &e) { return e.ref.ecu == ref.ecu; });
+      EraseItem(ref.cluster->ecus, ref.ecu);
+      return 0;
+    }
+    default:
+      // A database goes by closing it, a PDU with its frame.
+      return kvsimErrInvalidClass;
+  }
+}
+
+Status DatabaseRegistry::GetPropertySize(uint32_t object, uint32_t id, uint32_t *size) {
+  if (size == nullptr) return kvsimErrNullPointer;
+  std::lock_guard<std::mutex> lock(mutex_);
+  tEntry *entry = Resolve(object);
+  if (entry == nullptr) return kvsimErrInvalidDatabase;
+  cHandleSource handles(*this, entry->loaded);
+  PropertyValue value;
+  const Status status = GetDatabaseProperty(entry->ref, id, handles, &value);
+  if (status == 0) *size = static_cast<uint32_t>(value.size());
+  return status;
+}
+
+Status DatabaseRegistry::GetProperty(uint32_t object, uint32_t id, uint32_t size, void *value) {
+  std::lock_guard<std::mutex> lock(mutex_);
+  tEntry *entry = Resolve(object);
+  if (entry == nullptr) return kvsimErrInvalidDatabase;
+  cHandleSource handles(*this, entry->loaded);
+  PropertyValue known;
+  const Status status = GetDatabaseProperty(entry->ref, id, handles, &known);
+  if (status != 0) return status;
+  return CopyValueOut(known, size, value);
+}
+
+Status DatabaseRegistry::SetProperty(uint32_t object, uint32_t id, uint32_t size,
+                                     const void *value) {
+  std::lock_guard<std::mutex> lock(mutex_);
+  tEntry *entry = Resolve(object);
+  if (entry == nullptr) return kvsimErrInvalidDatabase;
+  // A property that the object does not have is unknown, not read-only.
+  cHandleSource handles(*this, entry->loaded);
+  PropertyValue current;
+  const Status known = GetDatabaseProperty(entry->ref, id, handles, &current);
+  if (known != 0) return known;
+  return SetDatabaseProperty(entry->ref, id, size, value);
+}
+
+Status DatabaseRegistry::Save(uint32_t handle, const char *path) {
+  std::lock_guard<std::mutex> lock(mutex_);
+  tEntry *entry = Resolve(handle);
+  if (entry == nullptr) return kvsimErrInvalidDatabase;
+  std::string target = path != nullptr ? DatabasePath(path) : std::string();
+  if (target.empty()) target = entry->loaded->path;
+  if (target.empty()) {
+    return Fail(kvsimErrDatabaseWrite, "the in-memory database has no file: give a path");
+  }
+  std::string error;
+  const Status status = SaveDatabaseFile(entry->loaded->model, target, &error);
+  return status != 0 ? Fail(status, error) : 0;
+}
+
+Status DatabaseRegistry::AddAlias(const char *alias, const char *path, uint64_t baudRate) {
+  if (alias == nullptr || path == nullptr) return kvsimErrNullPointer;
+  std::lock_guard<std::mutex> lock(mutex_);
+  const std::string name = alias;
+  // The list of aliases is comma-separated, and the in-memory name is taken.
+  if (name.empty() || name.find(',') != std::string::npos || name == kMemoryName) {
+    return kvsimErrInvalidName;
+  }
+  const std::string canonical = CanonicalPath(DatabasePath(path));
+  if (canonical.empty()) {
+    return Fail(kvsimErrDatabaseNotFound, name + ": no file at " + DatabasePath(path));
+  }
+  aliases_.Add(name, tAlias{canonical, baudRate});
+  return 0;
+}
+
+Status DatabaseRegistry::RemoveAlias(const char *alias) {
+  if (alias == nullptr) return kvsimErrNullPointer;
+  std::lock_guard<std::mutex> lock(mutex_);
+  return aliases_.Remove(alias) ? 0 : kvsimErrDatabaseNotFound;
+}
+
+Status DatabaseRegistry::GetListSizes(uint64_t target, uint32_t *aliasesSize, uint32_t *pathsSize) {
+  if (aliasesSize == nullptr || pathsSize == nullptr) return kvsimErrNullPointer;
+  if (target != 0) return kvsimErrInvalidArgument;  // only this machine
+  std::lock_guard<std::mutex> lock(mutex_);
+  std::string aliases, paths;
+  aliases_.Lists(&aliases, &paths);
+  *aliasesSize = static_cast<uint32_t>(aliases.size() + 1);
+  *pathsSize = static_cast<uint32_t>(paths.size() + 1);
+  return 0;
+}
+
+Status DatabaseRegistry::GetList(uint64_t target, uint32_t aliasesSize, char *aliases,
+                                 uint32_t pathsSize, char *paths, uint32_t *count) {
+  if (aliases == nullptr || paths == nullptr || count == nullptr) return kvsimErrNullPointer;
+  if (target != 0) return kvsimErrInvalidArgument;
+  std::lock_guard<std::mutex> lock(mutex_);
+  std::string aliasList, pathList;
+  aliases_.Lists(&aliasList, &pathList);
+  if (aliasList.size() >= aliasesSize || pathList.size() >= pathsSize) {
+    return kvErrDatabaseListChanged;
+  }
+  std::memcpy(aliases, aliasList.c_str(), aliasList.size() + 1);
+  std::memcpy(paths, pathList.c_str(), pathList.size() + 1);
+  *count = static_cast<uint32_t>(aliases_.Count());
+  return 0;
+}
+
+Status DatabaseRegistry::CopyCluster(const char *database, const char *cluster, tCluster *copy) {
+  if (database == nullptr || cluster == nullptr || copy == nullptr) return kvsimErrNullPointer;
+  std::lock_guard<std::mutex> lock(mutex_);
+  const std::string name = database;
+  tDatabase fromFile;
+  const tDatabase *source = nullptr;
+  if (name == kMemoryName) {
+    const auto memory = loaded_.find(name);
+    if (memory == loaded_.end()) return kvsimErrDatabaseNotFound;
+    source = &memory->second->model;
+  } else {
+    std::string key;
+    uint64_t aliasBaudRate = 0;
+    const Status located = LocateFile(name, &key, &aliasBaudRate);
+    if (located != 0) return located;
+    const auto open = loaded_.find(key);
+    if (open != loaded_.end()) {
+      source = &open->second->model;
+    } else {
+      const Status status = LoadFile(key, name, aliasBaudRate, &fromFile);
+      if (status != 0) return status;
+      source = &fromFile;
+    }
+  }
+  const std::string wanted = cluster;
+  for (const tCluster &each : source->clusters) {
+    if (wanted.empty() || each.name == wanted) {
+      *copy = each;
+      return 0;
+    }
+  }
+  return kvsimErrObjectNotFound;
+}
+
+std::string DatabaseRegistry::ErrorText() const {
+  std::lock_guard<std::mutex> lock(mutex_);
+  return errorText_;
+}
+
+size_t DatabaseRegistry::LoadedCount() const {
+  std::lock_guard<std::mutex> lock(mutex_);
+  return loaded_.size();
+}
+
+void DatabaseRegistry::Reset() {
+  std::lock_guard<std::mutex> lock(mutex_);
+  handles_.clear();
+  byObject_.clear();
+  loaded_.clear();
+  aliases_.Clear();
+  errorText_.clear();
+}
 
 }  // namespace nKvorSim

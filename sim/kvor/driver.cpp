@@ -39,6 +39,7 @@ void Driver::Reset() {
   systems_.CloseAll();
   running_.Reset();
   blinking_.Reset();
+  databases_.Reset();
   failures_.Clear();
   for (Network &network : networks_) network.Clear();
   bus_.Reset();

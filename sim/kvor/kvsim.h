@@ -136,7 +136,23 @@
  *                     and a mode of enum kvsimBlinkMode (else kvsimErrInvalidArgument). The mode
  *                     belongs to the interface, not to the handle: it stays after its system is
  *                     closed, until set again or reset (kvsimBlinkMode).
- *   kvdbCloseDatabase No call opens a database, so every handle is kvsimErrInvalidDatabase.
+ *   Databases         The kvdb functions serve databases read from database files (see the
+ *                     Databases section below): kvdbOpenDatabase takes an alias, an absolute
+ *                     path, a path relative to the directory in the environment variable
+ *                     KVSIM_DATABASE_DIR (else to the working directory), or ":memory:" for
+ *                     the one in-memory database, empty at its first open. A file opened again,
+ *                     by any name, is the same database with the same handle; it stays loaded
+ *                     until it has been closed as often as it was opened (closeAll: at once).
+ *                     Database object handles are 0x8CIIIIII, C the class number (0 database, 1
+ *                     cluster, 2 frame, 3 signal, 5 ECU, 8 PDU). Properties: names, comments,
+ *                     frame ID, CANExtID, PayloadLen, CANTxTime, CANioMode (0 CAN, 1 CAN FD),
+ *                     signal StartBit, NumBits, ByteOrdr (0 little-endian, 1 big-endian),
+ *                     DataType (0 signed, 1 unsigned, 2 IEEE float), ScaleFac, ScaleOff, Min,
+ *                     Max, Default, Unit, Mux* can be set; references, DefaultPayload,
+ *                     ConfigStatus, NameUniqueToCluster ("frame.signal") and the PDU's follow
+ *                     from them. A frame's PDU is the frame's payload: one PDU per frame at
+ *                     start bit 0 with update bit 0xFFFFFFFF (none). Subframes are not served.
+ *   kvdbCloseDatabase Answers kvsimErrInvalidDatabase for a handle of no loaded database.
  *   Error handles     kvBlink and kvdbCloseDatabase also answer an error session, given in place
  *                     of their object, with its status, as the session calls do.
  *   kvWriteState      Knows one state, kvState_LINScheduleChange, which selects the LIN schedule
@@ -242,8 +258,9 @@ enum kvsimBlinkMode { kvsimBlinkOff = 0, kvsimBlinkOn = 1 };
  * return kvsimErrSessionCleared), closes every system, stops every interface, turns every
  * interface's light off, lifts every hold (held calls that wait on no session go on), drops
  * injected failures, the call log (and turns it on), the signal values, the frames and the raised
- * conditions, numbers frames from 1 again, and sets the clock to 0. Handle generations keep
- * counting, so a handle of before the reset stays invalid. */
+ * conditions, numbers frames from 1 again, unloads every database, forgets every database alias,
+ * and sets the clock to 0. Handle generations keep counting, so a handle of before the reset
+ * stays invalid. */
 KVSIM_API void kvsimReset(void);
 
 /* ==== Injected failures ====================================================================== */
@@ -462,6 +479,36 @@ KVSIM_API int32_t kvsimOpenSessionCount(void);
 
 /* Number of open systems. */
 KVSIM_API int32_t kvsimOpenSystemCount(void);
+
+/* ==== Databases ============================================================================== */
+
+/* Statuses of the kvdb functions, besides the driver's general ones. */
+enum kvsimDatabaseStatus {
+  kvsimErrDatabaseNotFound = (int32_t)0xBFF62061, /* no alias, and no file, of that name */
+  kvsimErrDatabaseSyntax = (int32_t)0xBFF62062,   /* the file is not a database file; the text of
+                                                     kvsimDatabaseErrorText names the line */
+  kvsimErrObjectNotFound = (int32_t)0xBFF62063,   /* the parent has no object of that class and
+                                                     name */
+  kvsimErrObjectExists = (int32_t)0xBFF62064,     /* the name, frame identifier, multiplexer or
+                                                     cluster is taken already */
+  kvsimErrInvalidClass = (int32_t)0xBFF62065,     /* no object of that class under that parent, or
+                                                     one that cannot be deleted */
+  kvsimErrInvalidName = (int32_t)0xBFF62066,      /* not an identifier (a letter or '_', then
+                                                     letters, digits and '_') */
+  kvsimErrDatabaseWrite = (int32_t)0xBFF62067,    /* the database cannot be saved there, or cannot
+                                                     be written as a database file */
+  kvsimErrSignalLayout = (int32_t)0xBFF62068      /* kvPropSig_ConfigStatus, kvPropFrm_ConfigStatus:
+                                                     a signal does not fit its frame, or a frame
+                                                     has multiplexed signals and no multiplexer */
+};
+
+/* Copies the message of the latest open, save or alias that failed on its file ("tesla.dbc,
+ * line 12: bad scale '1x'") into `text`, cut to `size` - 1 bytes and NUL-terminated. Returns the
+ * length of the whole message; 0 when none has failed since the reset. */
+KVSIM_API int32_t kvsimDatabaseErrorText(char *text, uint32_t size);
+
+/* Number of databases loaded: opened and not yet closed as often. */
+KVSIM_API int32_t kvsimLoadedDatabaseCount(void);
 
 #ifdef __cplusplus
 }

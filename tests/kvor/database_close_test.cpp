@@ -1,12 +1,12 @@
-// kvdbCloseDatabase: no database is ever open in the driver, so every handle is refused, except
-// an error handle, which answers with its failure.
+// kvdbCloseDatabase: a handle of no loaded database is refused, whatever else it names; an error
+// handle answers with its failure.
 #include "kvor_test_support.h"
 
 namespace {
 
 using KvorDatabaseClose = KvorTest;
 
-TEST_F(KvorDatabaseClose, NoHandleNamesAnOpenDatabase) {
+TEST_F(KvorDatabaseClose, HandlesOfOtherObjectsAreNoDatabases) {
   uint32_t system = 0;
   ASSERT_EQ(kvSystemOpen(&system), 0);
   const uint32_t session = Create("CAN1", kvMode_FrameInStream);

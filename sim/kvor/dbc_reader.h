@@ -1,0 +1,26 @@
+// Reads the text of a CAN database file into a database of one cluster.
+#ifndef KVOR_SIM_DBC_READER_H
+#define KVOR_SIM_DBC_READER_H
+
+#include <cstdint>
+#include <string>
+#include <string_view>
+
+#include "database_model.h"
+
+namespace nKvorSim {
+
+// Where and why a text could not be read. Lines count from 1.
+struct tDbcError {
+  uint32_t line = 0;
+  std::string message;
+};
+
+// Reads `text` into *database, which is replaced. Statements that the database has no use for
+// are skipped whole. Returns false with *error filled for a text that does not follow the format;
+// *database is then unspecified.
+bool ReadDbc(std::string_view text, tDatabase *database, tDbcError *error);
+
+}  // namespace nKvorSim
+
+#endif
