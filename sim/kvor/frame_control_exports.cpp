@@ -72,6 +72,13 @@ int32_t kvsimLastEthernetWrite(uint32_t session, uint32_t index, void *buffer, u
   return length ? ToInt(*length) : -1;
 }
 
+int32_t kvsimSetWriteSink(uint32_t session, int32_t on) {
+  const std::shared_ptr<Session> target = FrameSession(session, IsFrameOutputMode);
+  if (!target) return -1;
+  target->LastWrites().SetSink(on != 0);
+  return 0;
+}
+
 int32_t kvsimDroppedFrames(uint32_t session) {
   const std::shared_ptr<Session> target = FrameSession(session, IsFrameInputMode);
   if (!target) return -1;

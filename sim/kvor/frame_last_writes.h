@@ -3,6 +3,7 @@
 #ifndef KVOR_SIM_FRAME_LAST_WRITES_H
 #define KVOR_SIM_FRAME_LAST_WRITES_H
 
+#include <atomic>
 #include <cstdint>
 #include <mutex>
 #include <optional>
@@ -13,6 +14,10 @@ namespace nKvorSim {
 class FrameLastWrites {
  public:
   void KeepRecords(const uint8_t *bytes, uint32_t size);
+  // A sink keeps the bytes of each record write and does nothing else with them: no check, no
+  // delivery. It is what a benchmark of the writer needs of the driver.
+  void SetSink(bool on) { sink_.store(on); }
+  bool Sink() const { return sink_.load(); }
   void KeepEthernet(std::vector<std::vector<uint8_t>> frames);
 
   // Copies up to `size` bytes of the last record write to `buffer`; returns how many it had.
@@ -24,6 +29,7 @@ class FrameLastWrites {
 
  private:
   mutable std::mutex mutex_;
+  std::atomic<bool> sink_{false};
   std::vector<uint8_t> records_;
   std::vector<std::vector<uint8_t>> ethernet_;
 };

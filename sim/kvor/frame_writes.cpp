@@ -28,6 +28,10 @@ Status WriteRecords(Driver &driver, Session &session, const void *buffer, uint32
   if (buffer == nullptr && size != 0) return kvsimErrNullPointer;
   Status status = CheckOutput(session, timeLimit, false);
   if (status != 0) return status;
+  if (session.LastWrites().Sink()) {
+    session.LastWrites().KeepRecords(static_cast<const uint8_t *>(buffer), size);
+    return 0;
+  }
   const RecordForm form = SessionRecordForm(session);
   const uint32_t limit = form == RecordForm::kFixed
                              ? std::min(PayloadLimit(session), kFixedPayloadMax)

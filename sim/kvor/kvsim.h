@@ -429,6 +429,11 @@ KVSIM_API int32_t kvsimLastEthernetWriteCount(uint32_t session);
 KVSIM_API int32_t kvsimLastEthernetWrite(uint32_t session, uint32_t index, void *buffer,
                                          uint32_t size);
 
+/* With `on` non-zero, kvWriteFrame on the output session only keeps the bytes it is given for
+ * kvsimLastWrite, after the checks of session, mode and time limit: the records are neither
+ * checked nor sent. Returns 0, or -1 for a session that is not a frame output session. */
+KVSIM_API int32_t kvsimSetWriteSink(uint32_t session, int32_t on);
+
 /* Number of frames dropped since the input session was made because its queue was full, or -1
  * for a session that is not a frame input session. A flush keeps the count. */
 KVSIM_API int32_t kvsimDroppedFrames(uint32_t session);

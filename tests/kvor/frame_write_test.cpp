@@ -94,6 +94,25 @@ TEST_F(KvorFrameWrite, TheLastWriteKeepsTheBytesAsGiven) {
   EXPECT_EQ(kvsimLastWrite(Create("FlexRay2", kvMode_FrameInStream), copy.data(), 1), -1);
 }
 
+TEST_F(KvorFrameWrite, ASinkKeepsEveryWriteUncheckedAndSendsNothing) {
+  const uint32_t writer = Create("CAN1", kvMode_FrameOutStream);
+  const uint32_t reader = Create("CAN2", kvMode_FrameInStream);
+  std::vector<uint8_t> bytes = Pack({{0x7, {1, 2}}}, true);
+  bytes[15] = 40;  // a fixed record of 40 bytes, which a check refuses
+  ASSERT_EQ(kvsimSetWriteSink(writer, 1), 0);
+  ASSERT_EQ(kvWriteFrame(writer, bytes.data(), static_cast<uint32_t>(bytes.size()), 0.0), 0);
+  std::vector<uint8_t> copy(bytes.size());
+  EXPECT_EQ(kvsimLastWrite(writer, copy.data(), static_cast<uint32_t>(copy.size())), 24);
+  EXPECT_EQ(copy, bytes);
+  uint32_t pending = 1;
+  ASSERT_EQ(kvGetProperty(reader, kvPropSession_NumPend, sizeof pending, &pending), 0);
+  EXPECT_EQ(pending, 0u) << "a sink delivers nothing";
+  EXPECT_EQ(kvsimSetWriteSink(writer, 0), 0);
+  EXPECT_EQ(kvWriteFrame(writer, bytes.data(), static_cast<uint32_t>(bytes.size()), 0.0),
+            kvsimErrInvalidFrame);
+  EXPECT_EQ(kvsimSetWriteSink(reader, 1), -1);
+}
+
 TEST_F(KvorFrameWrite, WritesNeedAnOutputSessionAndABufferForTheirSize) {
   const uint32_t writer = Create("CAN3", kvMode_FrameOutSinglePoint);
   const uint32_t reader = Create("CAN4", kvMode_FrameInStream);
