@@ -109,6 +109,25 @@ KVSV_EXPORT kvsvStatus kvsvSessionManualCreate(const char *database, const char 
                                                const char *list, const char *interfaceName,
                                                uint32_t mode, kvsvRefnum *reference);
 
+/* The host's open of a session reference: opens the project session named by the string handle
+ * *name, as defined in the project session file kvorSession.txt (beside the application in a
+ * built application, else in the directory "eTemporarySessionTextFileDir"). The first open on an
+ * interface also creates the sessions of the file that share its interface, database and
+ * cluster; their opens then take what was made. *session gets the session, or, when the open
+ * fails, an error session that gives the failure at its first use. `context` is not used.
+ * Always 0, with nothing done for a null `session`. */
+KVSV_EXPORT kvsvStatus kvsvSessionOpen(SvHandle *name, uint32_t *session, uint64_t context);
+
+/* The open and close of the library's internal session reference: *session gets 0xDEADFAB4,
+ * which stands for no driver session. Both 0. */
+KVSV_EXPORT kvsvStatus kvsvSessionInternalOpen(SvHandle *name, uint32_t *session);
+KVSV_EXPORT kvsvStatus kvsvSessionInternalClose(void);
+
+/* Copies the host handle *source into *target (made or resized to fit); the host's status.
+ * 0xBFF63015: `source` is null. */
+KVSV_EXPORT kvsvStatus kvsvInternalHandleToRef(void *reserved1, SvHandle *source,
+                                               void *reserved2, SvHandle *target);
+
 /* The host's close of a session reference (any reference is accepted and sent to the close of its
  * class). Clears the session in the driver, waits for calls that use it, frees its slot. 0. */
 KVSV_EXPORT kvsvStatus kvsvSessionClose(uint32_t session);

@@ -2,13 +2,13 @@
 
 #include <cstdlib>
 #include <cstring>
-#include <memory>
 #include <string>
 
 #include "core/internal_error.h"
 #include "core/sleep.h"
 #include "kvsvapi.h"
 #include "kvsvplatform.h"
+#include "session/malloc_block.h"
 
 namespace nKVSVAPI100 {
 
@@ -18,15 +18,11 @@ namespace {
 constexpr uint32_t kGuardPollMs = 100;
 constexpr uint32_t kGuardPolls = 1000;
 
-struct tFreeBlock {
-  void operator()(char *block) const { std::free(block); }
-};
-
 // The interface text as the driver gives it, or nothing.
 bool ReadInterfaceName(uint32_t handle, std::string &name) {
   uint32_t size = 0;
   if (kvGetPropertySize(handle, kvPropSession_IntfName, &size) < 0) return false;
-  std::unique_ptr<char, tFreeBlock> block(static_cast<char *>(std::malloc(size != 0 ? size : 1)));
+  tMallocBlock block(static_cast<char *>(std::malloc(size != 0 ? size : 1)));
   if (!block) return false;
   if (kvGetProperty(handle, kvPropSession_IntfName, size, block.get()) < 0) return false;
   name.assign(block.get(), size != 0 ? strnlen(block.get(), size) : 0);
