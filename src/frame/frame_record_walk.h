@@ -48,7 +48,7 @@ int32_t WalkRecords(const cFrameArrays &arrays, uint8_t *records, uint32_t bytes
         break;
     }
     uint8_t *record = records + offset;
-    kDecode(record, arrays.Element(i));
+    // A frame past the handles there are has no element to go into: the walk ends before it.
     SvHandle payload = nullptr;
     if (i < owned) {
       payload = arrays.Payload(i);
@@ -56,6 +56,7 @@ int32_t WalkRecords(const cFrameArrays &arrays, uint8_t *records, uint32_t bytes
       status = ReportInternalError(kComponentKvsvapi, nFile::kSessionIo, __LINE__, 0);
       break;
     }
+    kDecode(record, arrays.Element(i));
     if (payload != nullptr) {
       if constexpr (kRule == ePayloadRule::kClip) {
         if (record[kRecordPayloadLength] > payloadMax) {
