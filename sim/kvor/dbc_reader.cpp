@@ -41,15 +41,16 @@ class cDbcParser {
 
  private:
   // Takes the next token, which must be of `kind` (and, for punctuation, be `punctuation`). A
-  // statement that lives on one line passes its line as `line`, so that a token found on a later
-  // line counts as the line ending early.
+  // statement that lives on one line passes its line as `line`: its next token must then start
+  // where the one before it ended, or the line ended early. (A string may run over lines.)
   tDbcToken Take(Kind kind, const char *what, uint32_t line = 0, char punctuation = 0);
   bool PeekPunctuation(char c);
-  // Whether the next token lies on `line`.
-  bool OnLine(uint32_t line);
+  // Whether the next token goes on the line where the last one ended.
+  bool OnLine();
 
   uint32_t ToU32(const tDbcToken &token, const char *what);
   double ToDouble(const tDbcToken &token, const char *what);
+  uint64_t ToBaudRate(const tDbcToken &token);
 
   void ReadVersion(uint32_t line);
   void SkipSymbolList();
@@ -85,11 +86,12 @@ class cDbcParser {
 };
 
 tDbcToken cDbcParser::Take(Kind kind, const char *what, uint32_t line, char punctuation) {
+  const uint32_t previous = lexer_.LastLine();
   tDbcToken token = lexer_.Next();
-  if (token.kind == Kind::kEnd) {
-    Fail(line != 0 ? line : lexer_.LastLine(), std::string("the text ends before ") + what);
+  if (token.kind == Kind::kEnd) Fail(previous, std::string("the text ends before ") + what);
+  if (line != 0 && token.line != previous) {
+    Fail(previous, std::string("the line ends before ") + what);
   }
-  if (line != 0 && token.line != line) Fail(line, std::string("the line ends before ") + what);
   if (token.kind != kind || (punctuation != 0 && token.text[0] != punctuation)) {
     Fail(token.line, std::string("expected ") + what + ", found " + DescribeToken(token));
   }
@@ -101,9 +103,9 @@ bool cDbcParser::PeekPunctuation(char c) {
   return token.kind == Kind::kPunctuation && token.text[0] == c;
 }
 
-bool cDbcParser::OnLine(uint32_t line) {
+bool cDbcParser::OnLine() {
   const tDbcToken &token = lexer_.Peek();
-  return token.kind != Kind::kEnd && token.line == line;
+  return token.kind != Kind::kEnd && token.line == lexer_.LastLine();
 }
 
 uint32_t cDbcParser::ToU32(const tDbcToken &token, const char *what) {
@@ -127,6 +129,15 @@ double cDbcParser::ToDouble(const tDbcToken &token, const char *what) {
     Fail(token.line, std::string("bad ") + what + " '" + token.text + "'");
   }
   return value;
+}
+
+uint64_t cDbcParser::ToBaudRate(const tDbcToken &token) {
+  const double value = ToDouble(token, "baud rate");
+  // Whole bits per second, within what any bus could run at.
+  if (!(value >= 0.0 && value <= 1e12) || value != static_cast<double>(static_cast<uint64_t>(value))) {
+    Fail(token.line, "bad baud rate '" + token.text + "'");
+  }
+  return static_cast<uint64_t>(value);
 }
 
 void cDbcParser::Run() {
@@ -205,8 +216,8 @@ void cDbcParser::ReadFrame(uint32_t line) {
   Take(Kind::kPunctuation, "':' after the frame name", line, ':');
   const uint32_t length = ToU32(Take(Kind::kNumber, "the payload length", line), "payload length");
   std::string transmitter;
-  if (OnLine(line)) transmitter = Take(Kind::kIdentifier, "the transmitting node", line).text;
-  if (OnLine(line)) Fail(line, "unexpected " + DescribeToken(lexer_.Peek()) + " after the frame");
+  if (OnLine()) transmitter = Take(Kind::kIdentifier, "the transmitting node", line).text;
+  if (OnLine()) Fail(line, "unexpected " + DescribeToken(lexer_.Peek()) + " after the frame");
 
   tFrame frame;
   frame.name = name.text;
@@ -273,7 +284,7 @@ void cDbcParser::ReadSignal(uint32_t line) {
   signal.maximum = ToDouble(Take(Kind::kNumber, "the maximum", line), "maximum");
   Take(Kind::kPunctuation, "']' after the maximum", line, ']');
   signal.unit = Take(Kind::kString, "the unit", line).text;
-  while (OnLine(line)) {
+  while (OnLine()) {
     if (PeekPunctuation(',')) lexer_.Next();  // receivers are cut by commas, blanks or both
     const std::string receiver = Take(Kind::kIdentifier, "a receiving node", line).text;
     if (receiver != kNoNode) signal.receivers.push_back(receiver);
@@ -420,9 +431,9 @@ void cDbcParser::ReadAttribute(uint32_t line) {
     signal->defaultRaw = ToDouble(value, "start value");
     startValueSet_.insert(signal);
   } else if (onCluster && name == kAttrBaudRate) {
-    cluster_->baudRate = static_cast<uint64_t>(ToDouble(value, "baud rate"));
+    cluster_->baudRate = ToBaudRate(value);
   } else if (onCluster && name == kAttrFdBaudRate) {
-    cluster_->fdBaudRate = static_cast<uint64_t>(ToDouble(value, "baud rate"));
+    cluster_->fdBaudRate = ToBaudRate(value);
   } else if (onCluster && name == kAttrClusterName && value.kind == Kind::kString) {
     cluster_->name = value.text;
   }

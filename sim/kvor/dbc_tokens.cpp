@@ -44,7 +44,7 @@ const tDbcToken &cDbcLexer::Peek() {
 tDbcToken cDbcLexer::Next() {
   tDbcToken token = hasPeeked_ ? std::move(peeked_) : Scan();
   hasPeeked_ = false;
-  if (token.kind != tDbcToken::kEnd) lastLine_ = token.line;
+  if (token.kind != tDbcToken::kEnd) lastLine_ = token.endLine;
   return token;
 }
 
@@ -64,7 +64,7 @@ void cDbcLexer::SkipSpace() {
 tDbcToken cDbcLexer::Scan() {
   SkipSpace();
   tDbcToken token;
-  token.line = line_;
+  token.line = token.endLine = line_;
   token.column = static_cast<uint32_t>(position_ - lineStart_);
   if (position_ >= text_.size()) return token;
 
@@ -115,6 +115,7 @@ tDbcToken cDbcLexer::Scan() {
     }
     token.kind = tDbcToken::kString;
     token.text = std::move(value);
+    token.endLine = line_;
     return token;
   } else {
     ++position_;

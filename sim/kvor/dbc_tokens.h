@@ -21,7 +21,8 @@ struct tDbcToken {
   Kind kind = kEnd;
   std::string text;  // a string's text without its quotes and escapes
   uint32_t line = 0;
-  uint32_t column = 0;  // bytes before the token on its line
+  uint32_t endLine = 0;  // differs from `line` for a string that runs over lines
+  uint32_t column = 0;   // bytes before the token on its line
 };
 
 // "identifier 'BO_'", "the end of the text": how an error message names what it found.
@@ -33,7 +34,7 @@ class cDbcLexer {
 
   const tDbcToken &Peek();
   tDbcToken Next();
-  // The line of the token last taken by Next; 1 before the first.
+  // The line on which the token last taken by Next ends; 1 before the first.
   uint32_t LastLine() const { return lastLine_; }
 
  private:
