@@ -1,10 +1,11 @@
 // Every host test starts from a reset stand-in and must give back every handle, path and variant
-// that it made.
+// that it made. Also: readers for host data, and registering a reference the way the library does.
 #ifndef KVSV_TESTS_HOST_HOST_FIXTURE_H
 #define KVSV_TESTS_HOST_HOST_FIXTURE_H
 
 #include <gtest/gtest.h>
 
+#include <cstdint>
 #include <string>
 
 #include "kvsvplatform.h"
@@ -19,8 +20,37 @@ inline std::string Text(SvHandle string) {
   return text;
 }
 
-// Count of a string handle, read from its block.
-inline int32_t Count(SvHandle string) { return *static_cast<int32_t *>(*string); }
+inline bool AllBytesAre(const void *block, size_t size, unsigned char value) {
+  const auto *bytes = static_cast<const unsigned char *>(block);
+  for (size_t i = 0; i < size; ++i)
+    if (bytes[i] != value) return false;
+  return true;
+}
+
+// The arguments of svRegisterRefKind3, as the library passes them for a session.
+struct ReferenceArgs {
+  const char *name = "___kvorSesn#00010002";
+  uint32_t handle = 0x00010002;
+  const char *kind = "kvor";
+  const char *className = "KVOR Session";
+  const char *libraryPattern = "kvsvapi.*";
+  const char *openName = "kvsvSessionOpen";
+  const char *closeName = "kvsvSessionClose";
+  int32_t c21 = 21, c8 = 8, c1 = 1, z0 = 0, z1 = 0;
+  int32_t keep = 1;
+};
+
+// Every text in a string handle of its own, disposed of after the call: the host must copy them.
+inline int32_t Register(const ReferenceArgs &a, SvRefnum *cookie) {
+  SvHandle texts[] = {svsimMakeString(a.name),      svsimMakeString(a.kind),
+                      svsimMakeString(a.className), svsimMakeString(a.libraryPattern),
+                      svsimMakeString(a.openName),  svsimMakeString(a.closeName)};
+  const int32_t status =
+      svRegisterRefKind3(texts[0], a.handle, texts[1], texts[2], a.c21, cookie, a.c8, texts[3],
+                         a.c1, texts[4], texts[5], a.z0, a.z1, a.keep);
+  for (SvHandle h : texts) svDisposeHandle(h);
+  return status;
+}
 
 class HostTest : public ::testing::Test {
  protected:

@@ -1,14 +1,27 @@
-// A reset puts every control back to its default and leaves live host data alone.
+// The run-mode flags answer what was set, and a reset puts every control back to its default
+// while it leaves live host data alone.
 #include <gtest/gtest.h>
 
 #include "host_fixture.h"
-#include "reference_args.h"
 
 namespace {
 
 using Reset = HostTest;
 
-int32_t Nothing(uint64_t) { return 0; }
+TEST_F(Reset, RunModeFlagsAnswerWhatWasSet) {
+  const struct {
+    int32_t bound, runTime, fullFeature;
+  } modes[] = {{1, 0, 0}, {0, 1, 0}, {0, 0, 1}, {1, 1, 1}, {0, 0, 0}};
+  for (const auto &m : modes) {
+    svsimSetRunMode(m.bound, m.runTime, m.fullFeature);
+    EXPECT_EQ(svIsBoundApp(0), m.bound);
+    EXPECT_EQ(svIsRunTime(0), m.runTime);
+    EXPECT_EQ(svIsFullFeatureRunTime(0), m.fullFeature);
+  }
+}
+
+int gRuns = 0;
+int32_t CountRun(uint64_t) { return ++gRuns; }
 
 TEST_F(Reset, EveryControlGoesBackToItsDefault) {
   SvHandle survivor = svNewHandleClr(8);
@@ -16,7 +29,8 @@ TEST_F(Reset, EveryControlGoesBackToItsDefault) {
   SvRefnum cookie = 0;
   ASSERT_EQ(Register(ReferenceArgs(), &cookie), 0);
   svsimSetRefStatus(-3);
-  ASSERT_EQ(svSetCleanupProc(Nothing, 0, 6), 0);
+  gRuns = 0;
+  ASSERT_EQ(svSetCleanupProc(CountRun, 0, 6), 0);
   svsimFailAllocAt(1);
   EXPECT_EQ(svNewHandleClr(8), nullptr);
   svsimFailResizeAt(3);
@@ -28,9 +42,7 @@ TEST_F(Reset, EveryControlGoesBackToItsDefault) {
 
   EXPECT_EQ(svsimReset(), live);
 
-  EXPECT_EQ(svsimAllocCount(), 0u);
-  EXPECT_EQ(svsimResizeCount(), 0u);
-  EXPECT_EQ(svsimFreeCount(), 0u);
+  EXPECT_EQ(svsimAllocCount() + svsimResizeCount() + svsimFreeCount(), 0u);
   EXPECT_EQ(svsimInjectedFaults(), 0u);
   EXPECT_EQ(svsimLiveHandles(), live) << "live handles are not freed";
   EXPECT_EQ(svGetHandleSize(survivor), 8u);
@@ -49,6 +61,11 @@ TEST_F(Reset, EveryControlGoesBackToItsDefault) {
   EXPECT_EQ(Register(ReferenceArgs(), &cookie), 0) << "the forced status is gone";
   EXPECT_EQ(svsimPendingCleanups(), 0);
   EXPECT_EQ(svsimCleanupRegistrations(), 0);
+  EXPECT_EQ(svsimLastCleanup(nullptr, nullptr, nullptr), 0);
+  SvsimEndReport report{};
+  ASSERT_EQ(svsimEndProgram(&report), 0);
+  EXPECT_EQ(report.cleanupsRun, 0);
+  EXPECT_EQ(gRuns, 0) << "forgotten, not run";
 
   svDestroyPath(path);
   for (SvHandle h : {survivor, made, text}) svDisposeHandle(h);
