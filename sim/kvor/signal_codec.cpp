@@ -50,7 +50,12 @@ int64_t SignExtend(uint64_t raw, uint32_t bits) {
 
 uint64_t FloatBits(double value, uint32_t bits) {
   if (bits == 32) {
-    const float single = static_cast<float>(value);
+    // Beyond the range of a single the value is infinite; converting it as it is would not be
+    // defined.
+    const float limit = std::numeric_limits<float>::max();
+    const float single = value > limit    ? std::numeric_limits<float>::infinity()
+                         : value < -limit ? -std::numeric_limits<float>::infinity()
+                                          : static_cast<float>(value);
     uint32_t word;
     std::memcpy(&word, &single, sizeof word);
     return word;
