@@ -4,21 +4,12 @@ namespace nKVSVAPI100 {
 
 namespace {
 
-constexpr uint64_t kRawPerSecond = 10000000;
-constexpr uint64_t kNsPerSecond = 1000000000;
-// 1601-01-01 to 1904-01-01 in 100 ns units.
-constexpr uint64_t kRawEpochShift = 95616288000000000;
-// Larger rawTime values are absolute; this one and below are durations, kept small.
-constexpr uint64_t kRawRelativeLimit = 118653335999999999;
+using namespace nTime;
+
 // The same boundary in SvTime seconds, for the way back.
 constexpr int64_t kSvAbsoluteSeconds = 2303704800;
-// 1904-01-01 to 1970-01-01 in 1 ns units.
-constexpr uint64_t kNsEpochShift = 2082844800000000000;
-// 2^64 / 10^7 rounded up, and half of it rounded down: a remainder above that rounds up.
-constexpr uint64_t kFractionPerRaw = 1844674407371;
+// Half of a unit's fraction, rounded down: a remainder above it rounds up.
 constexpr uint64_t kFractionRawHalf = 922337203685;
-// 2^64 / 10^9 rounded up, and half of it.
-constexpr uint64_t kFractionPerNs = 18446744074;
 constexpr uint64_t kFractionNsHalf = 9223372037;
 
 static_assert(kRawRelativeLimit + 1 - kRawEpochShift == kSvAbsoluteSeconds * kRawPerSecond,
@@ -35,18 +26,6 @@ uint64_t RoundedUnits(uint64_t fraction, uint64_t perUnit, uint64_t half) {
 
 }  // namespace
 
-void RawTimeToSvTime(SvTime *result, const uint64_t *value) {
-  uint64_t v = *value;
-  if (v == 0) {
-    result->fraction = 0;
-    result->seconds = 0;
-    return;
-  }
-  if (v > kRawRelativeLimit) v -= kRawEpochShift;
-  result->seconds = static_cast<int64_t>(v / kRawPerSecond);
-  result->fraction = (v % kRawPerSecond) * kFractionPerRaw;
-}
-
 void SvTimeToRawTime(uint64_t *result, const SvTime *value) {
   if (value->seconds < 0) {
     *result = 0;
@@ -56,18 +35,6 @@ void SvTimeToRawTime(uint64_t *result, const SvTime *value) {
                  static_cast<uint64_t>(value->seconds) * kRawPerSecond;
   if (value->seconds >= kSvAbsoluteSeconds) raw += kRawEpochShift;
   *result = raw;
-}
-
-void NsTimeToSvTime(SvTime *result, const uint64_t *value) {
-  if (*value == 0) {
-    result->fraction = 0;
-    result->seconds = 0;
-    return;
-  }
-  // Every non-zero 1 ns time is absolute; the shift wraps for the largest values.
-  const uint64_t v = *value + kNsEpochShift;
-  result->seconds = static_cast<int64_t>(v / kNsPerSecond);
-  result->fraction = (v % kNsPerSecond) * kFractionPerNs;
 }
 
 void SvTimeToNsTime(uint64_t *result, const SvTime *value) {

@@ -12,8 +12,8 @@ namespace {
 // character fits.
 bool TokenFormat(const char *numbers, size_t room, char (&format)[32]) {
   if (room < 2) return false;
-  std::snprintf(format, sizeof format, "%s%%%zus", numbers, room - 1);
-  return true;
+  const int written = std::snprintf(format, sizeof format, "%s%%%zus", numbers, room - 1);
+  return written > 0 && static_cast<size_t>(written) < sizeof format;
 }
 
 bool IsBlank(int c) { return c == ' ' || c == '\t'; }
