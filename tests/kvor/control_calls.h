@@ -1,5 +1,6 @@
 // The driver's control calls, each in a scene where it works and leaves an effect that the
-// controls can see, for tests that make the calls fail or park them.
+// controls can see, for tests that make the calls fail or park them; and every call that takes a
+// session handle, for tests of handles that name no session or a failed one.
 #ifndef KVOR_CONTROL_CALLS_H
 #define KVOR_CONTROL_CALLS_H
 
@@ -83,6 +84,63 @@ inline std::vector<ControlCall> ControlCalls() {
        [](ControlScene &) { return kvsimBlinkMode("FlexRay1") == kvsimBlinkOn; }},
       {"kvdbCloseDatabase", false, kvsimErrInvalidDatabase, nothing,
        [](ControlScene &) { return kvdbCloseDatabase(0x03000001u, 0); }, nullptr},
+  };
+}
+
+// Outputs of the calls below, marked so that any write shows.
+struct UseOutputs {
+  std::vector<uint8_t> buffer = std::vector<uint8_t>(64, 0xEE);
+  double value = 42.0;
+  uint64_t stamp = 7;
+  uint32_t word = 0x5A5A5A5A;
+
+  bool Untouched() const {
+    return buffer == std::vector<uint8_t>(64, 0xEE) && value == 42.0 && stamp == 7 &&
+           word == 0x5A5A5A5A;
+  }
+};
+
+struct HandleUse {
+  const char *call;
+  int32_t notOpenStatus;  // the answer for a handle that is no open session
+  std::function<int32_t(uint32_t handle)> run;
+};
+
+// Every driver call that takes a session handle, with its outputs in `o`.
+inline std::vector<HandleUse> HandleUses(UseOutputs &o) {
+  constexpr int32_t kNoSession = kvsimErrInvalidSession;
+  constexpr uint32_t kMode = kvPropSession_Mode, kBaud = kvPropSession_IntfBaudRate;
+  constexpr uint32_t kTx = kvPropSessionSub_CANTxTime;
+  return {
+      {"kvGetPropertySize", kNoSession,
+       [&o](uint32_t h) { return kvGetPropertySize(h, kMode, &o.word); }},
+      {"kvGetProperty", kNoSession,
+       [&o](uint32_t h) { return kvGetProperty(h, kMode, 64, o.buffer.data()); }},
+      {"kvSetProperty", kNoSession,
+       [&o](uint32_t h) { return kvSetProperty(h, kBaud, 4, &o.word); }},
+      {"kvGetSubProperty", kNoSession,
+       [&o](uint32_t h) { return kvGetSubProperty(h, 0, kTx, 64, o.buffer.data()); }},
+      {"kvSetSubProperty", kNoSession,
+       [&o](uint32_t h) { return kvSetSubProperty(h, 0, kTx, 8, &o.value); }},
+      {"kvReadSignalSinglePoint", kNoSession,
+       [&o](uint32_t h) { return kvReadSignalSinglePoint(h, &o.value, 8, &o.stamp, 8); }},
+      {"kvWriteSignalSinglePoint", kNoSession,
+       [&o](uint32_t h) { return kvWriteSignalSinglePoint(h, &o.value, 8); }},
+      // A limit, so that a wrong answer shows as a failure rather than a hang.
+      {"kvWait", kNoSession,
+       [&o](uint32_t h) { return kvWait(h, kvsimConditionIntfCommunicating, 0, &o.word, 5.0); }},
+      {"kvStart", kNoSession, [](uint32_t h) { return kvStart(h, kvsimScopeNormal); }},
+      {"kvStop", kNoSession, [](uint32_t h) { return kvStop(h, kvsimScopeNormal); }},
+      {"kvFlush", kNoSession, [](uint32_t h) { return kvFlush(h); }},
+      {"kvConnectTerminals", kNoSession,
+       [](uint32_t h) { return kvConnectTerminals(h, "PXI_Trig0", "StartTrigger"); }},
+      {"kvDisconnectTerminals", kNoSession,
+       [](uint32_t h) { return kvDisconnectTerminals(h, "PXI_Trig0", "StartTrigger"); }},
+      {"kvhdnCreateSvTiming_FlexRayMacrotick", kNoSession,
+       [&o](uint32_t h) { return kvhdnCreateSvTiming_FlexRayMacrotick(h, &o.stamp); }},
+      {"kvBlink", kvsimErrInvalidObject, [](uint32_t h) { return kvBlink(h, kvsimBlinkOn); }},
+      {"kvdbCloseDatabase", kvsimErrInvalidDatabase,
+       [](uint32_t h) { return kvdbCloseDatabase(h, 1); }},
   };
 }
 

@@ -24,7 +24,11 @@ std::future<ReadResult> ReadAsync(uint32_t session) {
   });
 }
 
-TEST_F(KvorHeldCalls, HeldReadsParkUntilReleasedAndThenReadTheBusAsItIsThen) {
+bool StillRunning(const std::future<ReadResult> &call) {
+  return call.wait_for(std::chrono::seconds(0)) == std::future_status::timeout;
+}
+
+TEST_F(KvorHeldCalls, HeldReadsParkUntilReleasedOrTheirOwnSessionIsCleared) {
   std::vector<uint32_t> sessions;
   for (const char *name : {"CAN1", "CAN2", "CAN1"}) {
     sessions.push_back(Create(name, kvMode_SignalInSinglePoint, "Speed"));
@@ -34,34 +38,23 @@ TEST_F(KvorHeldCalls, HeldReadsParkUntilReleasedAndThenReadTheBusAsItIsThen) {
   for (uint32_t session : sessions) reads.push_back(ReadAsync(session));
   ASSERT_EQ(kvsimWaitParked("kvReadSignalSinglePoint", 3), 1);
 
+  ASSERT_EQ(kvClear(sessions[2]), 0);
+  const ReadResult cleared = reads[2].get();
+  EXPECT_EQ(cleared.status, kvsimErrSessionCleared);
+  EXPECT_EQ(cleared.value, -1.0);
+  EXPECT_TRUE(StillRunning(reads[0]) && StillRunning(reads[1])) << "the others stay parked";
+
   const double speed = 42.0;
   ASSERT_EQ(kvsimSetSignalValues(sessions[0], &speed, 1), 1);
   ASSERT_EQ(kvsimRelease("kvReadSignalSinglePoint"), 0);
-  for (auto &read : reads) {
-    const ReadResult result = read.get();
+  for (int i = 0; i < 2; ++i) {
+    const ReadResult result = reads[i].get();
     EXPECT_EQ(result.status, 0);
     EXPECT_EQ(result.value, 42.0) << "the read ran after the release";
   }
   double value = 0;
   EXPECT_EQ(kvReadSignalSinglePoint(sessions[0], &value, 8, nullptr, 0), 0)
       << "a released function no longer parks";
-}
-
-TEST_F(KvorHeldCalls, ClearingTheSessionEndsItsParkedCallOnly) {
-  const uint32_t cleared = Create("CAN1", kvMode_SignalInSinglePoint, "A");
-  const uint32_t kept = Create("CAN1", kvMode_SignalInSinglePoint, "A");
-  ASSERT_EQ(kvsimHold("kvReadSignalSinglePoint"), 0);
-  auto first = ReadAsync(cleared);
-  auto second = ReadAsync(kept);
-  ASSERT_EQ(kvsimWaitParked("kvReadSignalSinglePoint", 2), 1);
-  ASSERT_EQ(kvClear(cleared), 0);
-  const ReadResult result = first.get();
-  EXPECT_EQ(result.status, kvsimErrSessionCleared);
-  EXPECT_EQ(result.value, -1.0);
-  EXPECT_EQ(second.wait_for(std::chrono::seconds(0)), std::future_status::timeout)
-      << "the other call is still parked";
-  ASSERT_EQ(kvsimRelease("kvReadSignalSinglePoint"), 0);
-  EXPECT_EQ(second.get().status, 0);
 }
 
 TEST_F(KvorHeldCalls, AParkedCallIsPendingInTheLogAndMeetsItsInjectedFailureWhenReleased) {
@@ -101,53 +94,31 @@ TEST_F(KvorHeldCalls, ACallOnNoSessionParksUntilReleasedOrReset) {
   }
 }
 
-TEST_F(KvorHeldCalls, AHeldWaitParksBeforeItWaits) {
-  const uint32_t session = Create("CAN2", kvMode_FrameInStream);
-  ASSERT_EQ(kvsimRaiseCondition(session, kvsimConditionIntfCommunicating, 3), 0);
-  ASSERT_EQ(kvsimHold("kvWait"), 0);
-  auto wait = std::async(std::launch::async, [=] {
-    uint32_t value = 0;
-    return kvWait(session, kvsimConditionIntfCommunicating, 0, &value, -1.0);
-  });
-  ASSERT_EQ(kvsimWaitParked("kvWait", 1), 1);
-  EXPECT_EQ(wait.wait_for(std::chrono::seconds(0)), std::future_status::timeout)
-      << "a raised condition does not free a parked call";
-  ASSERT_EQ(kvsimRelease("kvWait"), 0);
-  EXPECT_EQ(wait.get(), 0);
-}
-
-TEST_F(KvorHeldCalls, EveryControlCallParksUntilReleased) {
+TEST_F(KvorHeldCalls, EveryControlCallParksUntilReleasedOrItsSessionIsCleared) {
   for (const ControlCall &call : ControlCalls()) {
     SCOPED_TRACE(call.function);
-    kvsimReset();
-    ControlScene scene = MakeControlScene();
-    call.prepare(scene);
-    ASSERT_EQ(kvsimHold(call.function), 0);
-    auto running = std::async(std::launch::async, [&] { return call.run(scene); });
-    ASSERT_EQ(kvsimWaitParked(call.function, 1), 1);
-    if (call.effect) {
-      EXPECT_FALSE(call.effect(scene)) << "parked before doing anything";
+    for (bool clear : {false, true}) {
+      if (clear && !call.onSession) continue;
+      kvsimReset();
+      ControlScene scene = MakeControlScene();
+      call.prepare(scene);
+      ASSERT_EQ(kvsimHold(call.function), 0);
+      auto running = std::async(std::launch::async, [&] { return call.run(scene); });
+      ASSERT_EQ(kvsimWaitParked(call.function, 1), 1);
+      if (call.effect) {
+        EXPECT_FALSE(call.effect(scene)) << "parked before doing anything";
+      }
+      if (clear) {
+        ASSERT_EQ(kvClear(scene.session), 0);
+        EXPECT_EQ(running.get(), kvsimErrSessionCleared);
+        continue;
+      }
+      ASSERT_EQ(kvsimRelease(call.function), 0);
+      EXPECT_EQ(running.get(), call.status);
+      if (call.effect) {
+        EXPECT_TRUE(call.effect(scene));
+      }
     }
-    ASSERT_EQ(kvsimRelease(call.function), 0);
-    EXPECT_EQ(running.get(), call.status);
-    if (call.effect) {
-      EXPECT_TRUE(call.effect(scene));
-    }
-  }
-}
-
-TEST_F(KvorHeldCalls, ClearingTheSessionEndsAParkedControlCallOnIt) {
-  for (const ControlCall &call : ControlCalls()) {
-    if (!call.onSession) continue;
-    SCOPED_TRACE(call.function);
-    kvsimReset();
-    ControlScene scene = MakeControlScene();
-    call.prepare(scene);
-    ASSERT_EQ(kvsimHold(call.function), 0);
-    auto running = std::async(std::launch::async, [&] { return call.run(scene); });
-    ASSERT_EQ(kvsimWaitParked(call.function, 1), 1);
-    ASSERT_EQ(kvClear(scene.session), 0);
-    EXPECT_EQ(running.get(), kvsimErrSessionCleared);
   }
 }
 

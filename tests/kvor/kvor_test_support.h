@@ -14,6 +14,10 @@
 
 class KvorTest : public ::testing::Test {
  protected:
+  // The interfaces of the stand-in's system, in the order the system lists them.
+  static constexpr const char *kInterfaceNames[] = {"CAN1", "CAN2",     "CAN3",     "CAN4", "LIN1",
+                                                    "LIN2", "FlexRay1", "FlexRay2", "ENET1"};
+
   void SetUp() override { kvsimReset(); }
   void TearDown() override { kvsimReset(); }
 
@@ -23,6 +27,12 @@ class KvorTest : public ::testing::Test {
     const int32_t status = kvCreateSession("DB", "Cluster", list, interfaceName, mode, &handle);
     EXPECT_EQ(status, 0) << "creating a session on " << interfaceName;
     return handle;
+  }
+
+  static uint32_t OpenSystem() {
+    uint32_t system = 0;
+    EXPECT_EQ(kvSystemOpen(&system), 0);
+    return system;
   }
 
   static uint32_t ReadU32(uint32_t object, uint32_t id) {

@@ -1,10 +1,15 @@
 // Session handles: the low 16 bits are a table index that callers rely on, the high bits tell a
-// stale handle from a live one.
+// stale handle from a live one, and a handle that names no open session is refused by every call.
+// Error sessions stand for a failed open: every use answers with the failure, and clearing them
+// ends them quietly.
+#include <algorithm>
+#include <iterator>
 #include <map>
 #include <random>
 #include <set>
 #include <vector>
 
+#include "control_calls.h"
 #include "kvor_test_support.h"
 
 namespace {
@@ -16,37 +21,27 @@ constexpr uint32_t kMaxSessions = 8192;
 uint32_t LowBits(uint32_t handle) { return handle & 0xFFFFu; }
 
 // The form every session handle must have: an index the library can use, and a top byte that
-// the library does not take for a system object, a database object or "no class".
+// the library does not take for a system object (0x01), a database object (bit 7) or "no class"
+// (0x0F).
 void ExpectSessionForm(uint32_t handle) {
   EXPECT_GE(LowBits(handle), 1u) << std::hex << handle;
   EXPECT_LE(LowBits(handle), kMaxSessions) << std::hex << handle;
   const uint32_t top = handle >> 24;
-  EXPECT_NE(top, 0x01u) << std::hex << handle;
-  EXPECT_NE(top, 0x0Fu) << std::hex << handle;
-  EXPECT_EQ(top & 0x80u, 0u) << std::hex << handle;
-}
-
-TEST_F(KvorSessionHandles, HandlesOfEveryInterfaceAndErrorSessionsHaveTheSessionForm) {
-  for (const char *name : {"CAN1", "CAN2", "CAN3", "CAN4", "LIN1", "LIN2", "FlexRay1", "FlexRay2",
-                           "ENET1", "ENET1/monitor"}) {
-    ExpectSessionForm(Create(name, kvMode_FrameInStream));
-  }
-  uint32_t error = 0;
-  ASSERT_EQ(kvhdnCreateErrorSession(kvsimErrUnknownInterface, &error), 0);
-  ExpectSessionForm(error);
+  EXPECT_TRUE(top != 0x01u && top != 0x0Fu && (top & 0x80u) == 0) << std::hex << handle;
 }
 
 TEST_F(KvorSessionHandles, LowBitsStayUniqueAmongOpenSessionsThroughCreatesAndClears) {
+  const char *names[std::size(kInterfaceNames) + 1] = {"ENET1/monitor"};
+  std::copy(std::begin(kInterfaceNames), std::end(kInterfaceNames), names + 1);
   std::mt19937 random(20240917);
   std::map<uint32_t, uint32_t> openByLowBits;
   std::set<uint32_t> everHanded;
   for (int step = 0; step < 20000; ++step) {
-    const bool create = openByLowBits.empty() || random() % 3 != 0;
-    if (create) {
+    if (openByLowBits.empty() || random() % 3 != 0) {
       uint32_t handle = 0;
-      const int32_t status =
-          step % 5 == 0 ? kvhdnCreateErrorSession(kvsimErrInternal, &handle)
-                        : kvCreateSession("", "", "A", "CAN1", kvMode_SignalInSinglePoint, &handle);
+      const int32_t status = step % 5 == 0 ? kvhdnCreateErrorSession(kvsimErrInternal, &handle)
+                                           : kvCreateSession("", "", "A", names[step % 10],
+                                                             kvMode_SignalInSinglePoint, &handle);
       ASSERT_EQ(status, 0) << "step " << step;
       ExpectSessionForm(handle);
       ASSERT_TRUE(openByLowBits.emplace(LowBits(handle), handle).second)
@@ -74,8 +69,7 @@ TEST_F(KvorSessionHandles, AFullTableRefusesTheNextSessionUntilOneIsCleared) {
   EXPECT_EQ(kvCreateSession("", "", "", "LIN1", kvMode_FrameInQueued, &refused),
             kvsimErrTooManySessions);
   EXPECT_EQ(refused, 0x12345678u) << "a refused creation hands out nothing";
-  uint32_t refusedError = 0;
-  EXPECT_EQ(kvhdnCreateErrorSession(kvsimErrInternal, &refusedError), kvsimErrTooManySessions);
+  EXPECT_EQ(kvhdnCreateErrorSession(kvsimErrInternal, &refused), kvsimErrTooManySessions);
 
   const uint32_t freed = handles[4321];
   ASSERT_EQ(kvClear(freed), 0);
@@ -87,50 +81,90 @@ TEST_F(KvorSessionHandles, AFullTableRefusesTheNextSessionUntilOneIsCleared) {
   EXPECT_EQ(ReadU32(reused, kvPropSession_Mode), static_cast<uint32_t>(kvMode_FrameInQueued));
 }
 
-TEST_F(KvorSessionHandles, AClearedHandleFailsEveryCall) {
-  const uint32_t stale = Create("CAN1", kvMode_SignalInSinglePoint, "A");
-  ASSERT_EQ(kvClear(stale), 0);
-
-  double value = 0;
-  uint32_t word = 0;
-  const struct {
-    const char *call;
-    int32_t status;
-  } calls[] = {
-      {"kvClear", kvClear(stale)},
-      {"kvGetPropertySize", kvGetPropertySize(stale, kvPropSession_Mode, &word)},
-      {"kvGetProperty", kvGetProperty(stale, kvPropSession_Mode, 4, &word)},
-      {"kvSetProperty", kvSetProperty(stale, kvPropSession_IntfBaudRate, 4, &word)},
-      {"kvGetSubProperty", kvGetSubProperty(stale, 0, kvPropSessionSub_CANTxTime, 8, &value)},
-      {"kvSetSubProperty", kvSetSubProperty(stale, 0, kvPropSessionSub_CANTxTime, 8, &value)},
-      {"kvReadSignalSinglePoint", kvReadSignalSinglePoint(stale, &value, 8, nullptr, 0)},
-      {"kvWriteSignalSinglePoint", kvWriteSignalSinglePoint(stale, &value, 8)},
-      {"kvWait", kvWait(stale, kvsimConditionIntfCommunicating, 0, &word, 5.0)},
-  };
-  for (const auto &call : calls) {
-    EXPECT_EQ(call.status, kvsimErrInvalidSession) << call.call;
-  }
-}
-
-TEST_F(KvorSessionHandles, HandlesThatNeverNamedASessionAreInvalid) {
+TEST_F(KvorSessionHandles, EveryCallRefusesAHandleThatNamesNoOpenSession) {
+  const uint32_t cleared = Create("CAN1", kvMode_SignalInSinglePoint, "A");
+  ASSERT_EQ(kvClear(cleared), 0);
   const uint32_t live = Create("CAN1", kvMode_SignalInSinglePoint, "A");
-  uint32_t word = 0;
-  for (uint32_t forged : {0u, live + 1, live ^ 0x00010000u, 0x0F000001u, 0x80000001u}) {
-    EXPECT_EQ(kvGetProperty(forged, kvPropSession_Mode, 4, &word), kvsimErrInvalidSession)
-        << std::hex << forged;
-    EXPECT_EQ(kvClear(forged), kvsimErrInvalidSession) << std::hex << forged;
+  UseOutputs outputs;
+  const std::vector<HandleUse> uses = HandleUses(outputs);
+  for (uint32_t handle :
+       {0u, cleared, live + 1, live ^ 0x00010000u, 0x0F000001u, 0x80000001u, 0x20FF1FFFu}) {
+    SCOPED_TRACE(testing::Message() << std::hex << handle);
+    for (const HandleUse &use : uses) {
+      outputs = UseOutputs();
+      EXPECT_EQ(use.run(handle), use.notOpenStatus) << use.call;
+      EXPECT_TRUE(outputs.Untouched()) << use.call;
+    }
+    EXPECT_EQ(kvClear(handle), kvsimErrInvalidSession);
+    EXPECT_EQ(kvsimSessionStarted(handle), -1);
   }
   EXPECT_EQ(kvsimOpenSessionCount(), 1);
+  EXPECT_EQ(kvsimSessionStarted(live), 0);
 }
 
-TEST_F(KvorSessionHandles, ResetEndsEverySessionAndTheirHandlesStayInvalid) {
-  const uint32_t before = Create("CAN3", kvMode_SignalInSinglePoint, "A");
-  kvsimReset();
+using KvorErrorSessions = KvorTest;
+
+constexpr int32_t kOpenFailure = static_cast<int32_t>(0xBFF6308A);
+
+TEST_F(KvorErrorSessions, EveryUseAnswersWithItsStatusAndTouchesNothing) {
+  const uint32_t session = Create("CAN1", kvMode_SignalInSinglePoint, "A");
+  UseOutputs outputs;
+  const std::vector<HandleUse> uses = HandleUses(outputs);
+  const int32_t failures[] = {kOpenFailure, kvsimErrUnknownInterface, -1};
+  uint32_t handles[3] = {};
+  for (int i = 0; i < 3; ++i) {
+    const int32_t failure = failures[i];
+    SCOPED_TRACE(testing::Message() << std::hex << failure);
+    uint32_t &handle = handles[i];
+    ASSERT_EQ(kvhdnCreateErrorSession(failure, &handle), 0);
+    for (const HandleUse &use : uses) {
+      outputs = UseOutputs();
+      EXPECT_EQ(use.run(handle), failure) << use.call;
+      EXPECT_TRUE(outputs.Untouched()) << use.call;
+    }
+    // The controls do not take it for a session.
+    double values[1] = {1.0};
+    EXPECT_EQ(kvsimSetSignalValues(handle, values, 1), -1);
+    EXPECT_EQ(kvsimGetSignalValues(handle, values, 1), -1);
+    EXPECT_EQ(kvsimRaiseCondition(handle, kvsimConditionIntfCommunicating, 1), -1);
+  }
+  uint32_t size = 0;
+  for (int i = 0; i < 3; ++i) {
+    EXPECT_EQ(kvGetPropertySize(handles[i], kvPropSession_IntfName, &size), failures[i])
+        << "each keeps its own failure";
+  }
+  EXPECT_EQ(ReadText(session, kvPropSession_IntfName), "CAN1") << "sessions live beside them";
+  EXPECT_EQ(kvSystemClose(session), kvsimErrInvalidObject) << "a real session is not a system";
+  EXPECT_EQ(kvsimOpenSessionCount(), 4);
+}
+
+TEST_F(KvorErrorSessions, ClearOrSystemCloseEndsItWithSuccess) {
+  const struct {
+    const char *call;
+    int32_t (*end)(uint32_t);
+    int32_t again;  // what the same call answers once the handle is gone
+  } ends[] = {{"kvClear", kvClear, kvsimErrInvalidSession},
+              {"kvSystemClose", kvSystemClose, kvsimErrInvalidObject}};
+  for (const auto &end : ends) {
+    SCOPED_TRACE(end.call);
+    uint32_t handle = 0;
+    ASSERT_EQ(kvhdnCreateErrorSession(kOpenFailure, &handle), 0);
+    ASSERT_EQ(kvsimOpenSessionCount(), 1);
+    EXPECT_EQ(end.end(handle), 0);
+    EXPECT_EQ(kvsimOpenSessionCount(), 0);
+    uint32_t size = 0;
+    EXPECT_EQ(kvGetPropertySize(handle, kvPropSession_IntfName, &size), kvsimErrInvalidSession);
+    EXPECT_EQ(end.end(handle), end.again) << "a second time";
+  }
+}
+
+TEST_F(KvorErrorSessions, OnlyAnErrorCanBeKept) {
+  uint32_t handle = 0x77;
+  EXPECT_EQ(kvhdnCreateErrorSession(0, &handle), kvsimErrInvalidArgument);
+  EXPECT_EQ(kvhdnCreateErrorSession(0x3FF60001, &handle), kvsimErrInvalidArgument);
+  EXPECT_EQ(kvhdnCreateErrorSession(kOpenFailure, nullptr), kvsimErrNullPointer);
+  EXPECT_EQ(handle, 0x77u);
   EXPECT_EQ(kvsimOpenSessionCount(), 0);
-  const uint32_t after = Create("CAN3", kvMode_SignalInSinglePoint, "A");
-  EXPECT_NE(after, before);
-  uint32_t word = 0;
-  EXPECT_EQ(kvGetProperty(before, kvPropSession_Mode, 4, &word), kvsimErrInvalidSession);
 }
 
 }  // namespace

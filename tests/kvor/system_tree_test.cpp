@@ -1,7 +1,8 @@
-// The system, its devices and interfaces: their properties, and handles that the library's
+// The system, its devices and interfaces: their properties, handles that the library's
 // classification by bits (top byte 0x01; low 4 bits interface, bits 4-15 device, else system)
-// puts in the right class.
+// puts in the right class, and the identification light of each interface (kvBlink).
 #include <algorithm>
+#include <iterator>
 #include <set>
 #include <string>
 #include <vector>
@@ -12,111 +13,58 @@ namespace {
 
 using KvorSystemTree = KvorTest;
 
-enum HandleClass : uint32_t {
-  kSessionClass = 0x100000,
-  kSystemClass = 0x110000,
-  kDeviceClass = 0x120000,
-  kInterfaceClass = 0x130000,
-  kNoClass = 0xFF0000
-};
+enum HandleClass : uint32_t { kOther, kSystem, kDevice, kInterface };
 
-// The classification by which the library tells the kind of a handle.
-uint32_t ClassOf(uint32_t handle) {
-  if (handle == 0) return kNoClass;
-  if (handle & 0x80000000u) return (handle >> 8) & 0xF0000u;
-  if ((handle >> 24) == 0x01) {
-    if (handle & 0xFu) return kInterfaceClass;
-    if (handle & 0xFFF0u) return kDeviceClass;
-    return kSystemClass;
-  }
-  if ((handle >> 24) == 0x0F) return kNoClass;
-  return kSessionClass;
+// The classification by which the library tells the kind of a system object.
+HandleClass ClassOf(uint32_t handle) {
+  if ((handle >> 24) != 0x01) return kOther;
+  if (handle & 0xFu) return kInterface;
+  return (handle & 0xFFF0u) ? kDevice : kSystem;
 }
 
-uint32_t OpenSystem() {
-  uint32_t system = 0;
-  EXPECT_EQ(kvSystemOpen(&system), 0);
-  return system;
-}
-
-TEST_F(KvorSystemTree, TheSystemTellsTheDriverVersion) {
+TEST_F(KvorSystemTree, DevicesAndInterfacesTellWhatTheyAreAndWhereTheyBelong) {
   const uint32_t system = OpenSystem();
-  EXPECT_EQ(ClassOf(system), kSystemClass) << std::hex << system;
-  const struct {
-    uint32_t id;
-    uint32_t value;
-  } versions[] = {
-      {kvPropSys_VerMajor, KVSIM_VERSION_MAJOR},   {kvPropSys_VerMinor, KVSIM_VERSION_MINOR},
-      {kvPropSys_VerUpdate, KVSIM_VERSION_UPDATE}, {kvPropSys_VerPhase, KVSIM_VERSION_PHASE},
-      {kvPropSys_VerBuild, KVSIM_VERSION_BUILD},
-  };
-  for (const auto &v : versions) {
-    uint32_t size = 0;
-    ASSERT_EQ(kvGetPropertySize(system, v.id, &size), 0) << std::hex << v.id;
-    EXPECT_EQ(size, 4u);
-    EXPECT_EQ(ReadU32(system, v.id), v.value) << std::hex << v.id;
-  }
-}
-
-TEST_F(KvorSystemTree, TwoDevicesWithDistinctSerialNumbers) {
-  const uint32_t system = OpenSystem();
+  EXPECT_EQ(ClassOf(system), kSystem) << std::hex << system;
   const std::vector<uint32_t> devices = ReadHandles(system, kvPropSys_DevRefs);
   ASSERT_EQ(devices.size(), 2u);
   const struct {
     const char *name;
-    uint32_t serial;
-    uint32_t ports;
-  } expected[] = {{"BusBox 6 CAN/LIN", 1001234, 6}, {"BusBox 3 FlexRay/Ethernet", 1001235, 3}};
-  for (size_t i = 0; i < devices.size(); ++i) {
-    EXPECT_EQ(ClassOf(devices[i]), kDeviceClass) << std::hex << devices[i];
-    EXPECT_EQ(ReadText(devices[i], kvPropDev_Name), expected[i].name);
-    EXPECT_EQ(ReadU32(devices[i], kvPropDev_SerNum), expected[i].serial);
-    EXPECT_EQ(ReadU32(devices[i], kvPropDev_NumPorts), expected[i].ports);
-    EXPECT_EQ(ReadHandles(devices[i], kvPropDev_IntfRefs).size(), expected[i].ports);
+    uint32_t serial, ports;
+  } expectedDevices[] = {{"BusBox 6 CAN/LIN", 1001234, 6},
+                         {"BusBox 3 FlexRay/Ethernet", 1001235, 3}};
+  for (size_t i = 0; i < 2; ++i) {
+    SCOPED_TRACE(expectedDevices[i].name);
+    EXPECT_EQ(ClassOf(devices[i]), kDevice) << std::hex << devices[i];
+    EXPECT_EQ(ReadText(devices[i], kvPropDev_Name), expectedDevices[i].name);
+    EXPECT_EQ(ReadU32(devices[i], kvPropDev_SerNum), expectedDevices[i].serial);
+    EXPECT_EQ(ReadU32(devices[i], kvPropDev_NumPorts), expectedDevices[i].ports);
+    EXPECT_EQ(ReadHandles(devices[i], kvPropDev_IntfRefs).size(), expectedDevices[i].ports);
   }
-}
 
-TEST_F(KvorSystemTree, InterfacesHaveTheirNamesProtocolsAndDevice) {
-  const uint32_t system = OpenSystem();
   const std::vector<uint32_t> interfaces = ReadHandles(system, kvPropSys_IntfRefs);
-  const std::vector<uint32_t> devices = ReadHandles(system, kvPropSys_DevRefs);
-  ASSERT_EQ(devices.size(), 2u);
-  const struct {
-    const char *name;
-    uint32_t protocol;
-    uint32_t device;  // index in kvPropSys_DevRefs
-  } expected[] = {
-      {"CAN1", kvProtocol_CAN, 0},         {"CAN2", kvProtocol_CAN, 0},
-      {"CAN3", kvProtocol_CAN, 0},         {"CAN4", kvProtocol_CAN, 0},
-      {"LIN1", kvProtocol_LIN, 0},         {"LIN2", kvProtocol_LIN, 0},
-      {"FlexRay1", kvProtocol_FlexRay, 1}, {"FlexRay2", kvProtocol_FlexRay, 1},
-      {"ENET1", kvProtocol_Ethernet, 1},
-  };
-  ASSERT_EQ(interfaces.size(), std::size(expected));
-  std::set<uint32_t> distinct(interfaces.begin(), interfaces.end());
-  EXPECT_EQ(distinct.size(), interfaces.size());
+  const uint32_t protocols[] = {kvProtocol_CAN,     kvProtocol_CAN,     kvProtocol_CAN,
+                                kvProtocol_CAN,     kvProtocol_LIN,     kvProtocol_LIN,
+                                kvProtocol_FlexRay, kvProtocol_FlexRay, kvProtocol_Ethernet};
+  ASSERT_EQ(interfaces.size(), std::size(kInterfaceNames));
+  EXPECT_EQ(std::set<uint32_t>(interfaces.begin(), interfaces.end()).size(), interfaces.size());
   for (size_t i = 0; i < interfaces.size(); ++i) {
+    SCOPED_TRACE(kInterfaceNames[i]);
     const uint32_t intf = interfaces[i];
-    EXPECT_EQ(ClassOf(intf), kInterfaceClass) << std::hex << intf;
-    uint32_t size = 0;
-    ASSERT_EQ(kvGetPropertySize(intf, kvPropIntf_Name, &size), 0);
-    EXPECT_EQ(size, std::string(expected[i].name).size() + 1) << "the size counts the NUL";
-    EXPECT_EQ(ReadText(intf, kvPropIntf_Name), expected[i].name);
-    EXPECT_EQ(ReadU32(intf, kvPropIntf_Protocol), expected[i].protocol) << expected[i].name;
-    const uint32_t device = devices[expected[i].device];
-    EXPECT_EQ(ReadU32(intf, kvPropIntf_DevRef), device) << expected[i].name;
+    EXPECT_EQ(ClassOf(intf), kInterface) << std::hex << intf;
+    EXPECT_EQ(ReadText(intf, kvPropIntf_Name), kInterfaceNames[i]);
+    EXPECT_EQ(ReadU32(intf, kvPropIntf_Protocol), protocols[i]);
+    const uint32_t device = devices[i < 6 ? 0 : 1];
+    EXPECT_EQ(ReadU32(intf, kvPropIntf_DevRef), device);
     const std::vector<uint32_t> siblings = ReadHandles(device, kvPropDev_IntfRefs);
-    EXPECT_NE(std::find(siblings.begin(), siblings.end(), intf), siblings.end())
-        << expected[i].name << " is listed by its device";
+    EXPECT_NE(std::find(siblings.begin(), siblings.end(), intf), siblings.end());
   }
   EXPECT_EQ(ReadHandles(system, kvPropSys_IntfRefsAll), interfaces);
-}
+  std::vector<uint32_t> room(9, 0xEEEEEEEE);
+  EXPECT_EQ(kvGetProperty(system, kvPropSys_IntfRefs, 8 * 4, room.data()), kvsimErrBufferTooSmall);
+  EXPECT_EQ(room, std::vector<uint32_t>(9, 0xEEEEEEEE)) << "an array needs room for every handle";
 
-TEST_F(KvorSystemTree, InterfaceListsByProtocol) {
-  const uint32_t system = OpenSystem();
   const struct {
-    uint32_t id;
-    uint32_t protocol;
+    uint32_t id, protocol;
     size_t count;
   } lists[] = {
       {kvPropSys_IntfRefsCAN, kvProtocol_CAN, 4},
@@ -125,23 +73,12 @@ TEST_F(KvorSystemTree, InterfaceListsByProtocol) {
       {kvPropSys_IntfRefsEthernet, kvProtocol_Ethernet, 1},
   };
   for (const auto &list : lists) {
-    const std::vector<uint32_t> interfaces = ReadHandles(system, list.id);
-    EXPECT_EQ(interfaces.size(), list.count) << std::hex << list.id;
-    for (uint32_t intf : interfaces) {
+    const std::vector<uint32_t> listed = ReadHandles(system, list.id);
+    EXPECT_EQ(listed.size(), list.count) << std::hex << list.id;
+    for (uint32_t intf : listed) {
       EXPECT_EQ(ReadU32(intf, kvPropIntf_Protocol), list.protocol) << std::hex << list.id;
     }
   }
-}
-
-TEST_F(KvorSystemTree, AnArrayNeedsRoomForEveryHandle) {
-  const uint32_t system = OpenSystem();
-  uint32_t size = 0;
-  ASSERT_EQ(kvGetPropertySize(system, kvPropSys_IntfRefs, &size), 0);
-  EXPECT_EQ(size, 9u * 4u);
-  std::vector<uint32_t> handles(9, 0xEEEEEEEE);
-  EXPECT_EQ(kvGetProperty(system, kvPropSys_IntfRefs, size - 4, handles.data()),
-            kvsimErrBufferTooSmall);
-  EXPECT_EQ(handles, std::vector<uint32_t>(9, 0xEEEEEEEE));
 }
 
 TEST_F(KvorSystemTree, HardwarePropertiesCannotBeSetAndUnknownOnesAreRefused) {
@@ -203,20 +140,42 @@ TEST_F(KvorSystemTree, HandlesOutsideTheTreeAreRefused) {
   EXPECT_EQ(kvSystemOpen(nullptr), kvsimErrNullPointer);
 }
 
-TEST_F(KvorSystemTree, SessionHandlesAreOfTheSessionClass) {
-  const uint32_t session = Create("FlexRay2", kvMode_FrameInStream);
-  EXPECT_EQ(ClassOf(session), kSessionClass) << std::hex << session;
-  uint32_t error = 0;
-  ASSERT_EQ(kvhdnCreateErrorSession(kvsimErrInternal, &error), 0);
-  EXPECT_EQ(ClassOf(error), kSessionClass) << std::hex << error;
+using KvorBlink = KvorTest;
+
+TEST_F(KvorBlink, EachInterfaceHandleSetsTheLightOfItsOwnInterface) {
+  const std::vector<uint32_t> interfaces = ReadHandles(OpenSystem(), kvPropSys_IntfRefsAll);
+  ASSERT_EQ(interfaces.size(), 9u);
+  for (uint32_t lit : interfaces) {
+    const std::string litName = ReadText(lit, kvPropIntf_Name);
+    SCOPED_TRACE(litName);
+    ASSERT_EQ(kvBlink(lit, kvsimBlinkOn), 0);
+    for (uint32_t other : interfaces) {
+      const std::string name = ReadText(other, kvPropIntf_Name);
+      EXPECT_EQ(kvsimBlinkMode(name.c_str()), other == lit ? kvsimBlinkOn : kvsimBlinkOff) << name;
+    }
+    for (uint32_t mode : {2u, 0xFFFFFFFFu}) {
+      EXPECT_EQ(kvBlink(lit, mode), kvsimErrInvalidArgument) << mode;
+      EXPECT_EQ(kvsimBlinkMode(litName.c_str()), kvsimBlinkOn) << "an unknown mode changes nothing";
+    }
+    ASSERT_EQ(kvBlink(lit, kvsimBlinkOff), 0);
+    EXPECT_EQ(kvsimBlinkMode(litName.c_str()), kvsimBlinkOff);
+  }
 }
 
-TEST_F(KvorSystemTree, ResetClosesEverySystem) {
+TEST_F(KvorBlink, OnlyInterfacesOfAnOpenSystemBlinkAndTheLightOutlivesTheSystem) {
+  const uint32_t closed = OpenSystem();
+  const uint32_t closedInterface = ReadHandles(closed, kvPropSys_IntfRefsFlexRay).at(1);
+  ASSERT_EQ(kvBlink(closedInterface, kvsimBlinkOn), 0);
+  ASSERT_EQ(kvSystemClose(closed), 0);
+  EXPECT_EQ(kvsimBlinkMode("FlexRay2"), kvsimBlinkOn);
+
   const uint32_t system = OpenSystem();
-  kvsimReset();
-  EXPECT_EQ(kvsimOpenSystemCount(), 0);
-  uint32_t size = 0;
-  EXPECT_EQ(kvGetPropertySize(system, kvPropSys_VerMajor, &size), kvsimErrInvalidObject);
+  const uint32_t device = ReadHandles(system, kvPropSys_DevRefs).front();
+  const uint32_t session = Create("CAN1", kvMode_FrameInStream);
+  for (uint32_t handle : {0u, system, device, closedInterface, session, 0x01FF0101u}) {
+    EXPECT_EQ(kvBlink(handle, kvsimBlinkOff), kvsimErrInvalidObject) << std::hex << handle;
+  }
+  EXPECT_EQ(kvsimBlinkMode("FlexRay2"), kvsimBlinkOn);
 }
 
 }  // namespace
