@@ -181,6 +181,28 @@ int32_t kvReadSignalSinglePoint(uint32_t session, double *values, uint32_t value
                                 uint64_t *timestamps, uint32_t timestampsSize);
 int32_t kvWriteSignalSinglePoint(uint32_t session, const double *values, uint32_t valuesSize);
 
+/* Waveforms: `buffers` holds one sample buffer per signal of the session, each `bufferSize`
+ * bytes. A read fills every buffer with the same number of evenly spaced samples, and gives the
+ * raw time of the first, the interval in seconds and that number; a write takes bufferSize / 8
+ * samples from each buffer. */
+int32_t kvhdnReadSignalWaveform(uint32_t session, double timeout, uint64_t *startTime,
+                                double *interval, double *const *buffers, uint32_t bufferSize,
+                                uint32_t *numSamples);
+int32_t kvhdnWriteSignalWaveform(uint32_t session, double timeout, const double *const *buffers,
+                                 uint32_t bufferSize);
+
+/* Value and timestamp pairs. The value and timestamp regions hold one run per signal, in list
+ * order, all runs of one length (the region's size over 8 bytes per signal); the pair count
+ * region one 32-bit count per signal, the pairs used at the start of its run. A read takes the
+ * pairs stamped no later than *timeLimit (raw time; null for no limit); a write's timestamps may
+ * be null (size 0), and the driver stamps the values itself. */
+int32_t kvReadSignalXY(uint32_t session, const uint64_t *timeLimit, double *values,
+                       uint32_t valuesSize, uint64_t *timestamps, uint32_t timestampsSize,
+                       uint32_t *numPairs, uint32_t numPairsSize);
+int32_t kvWriteSignalXY(uint32_t session, double timeout, const double *values,
+                        uint32_t valuesSize, const uint64_t *timestamps, uint32_t timestampsSize,
+                        const uint32_t *numPairs, uint32_t numPairsSize);
+
 #ifdef __cplusplus
 }
 #endif

@@ -48,6 +48,13 @@ int32_t AddFailure(const char *function, std::optional<uint32_t> propertyId, int
   return 0;
 }
 
+// Reads that wait for the clock to reach a time look again at each move of it.
+void WakeClockWaits() {
+  for (const std::shared_ptr<Session> &session : Driver::Instance().Sessions().All()) {
+    session->Events().Notify();
+  }
+}
+
 }  // namespace
 
 extern "C" {
@@ -87,9 +94,15 @@ int32_t kvsimCountPropertyReads(uint32_t propertyId) {
   return CountToInt(Driver::Instance().Log().CountPropertyReads(propertyId));
 }
 
-void kvsimSetClock(uint64_t rawTime) { Driver::Instance().Clock().Set(rawTime); }
+void kvsimSetClock(uint64_t rawTime) {
+  Driver::Instance().Clock().Set(rawTime);
+  WakeClockWaits();
+}
 
-void kvsimAdvanceClock(uint64_t delta) { Driver::Instance().Clock().Advance(delta); }
+void kvsimAdvanceClock(uint64_t delta) {
+  Driver::Instance().Clock().Advance(delta);
+  WakeClockWaits();
+}
 
 uint64_t kvsimClock(void) { return Driver::Instance().Clock().Now(); }
 

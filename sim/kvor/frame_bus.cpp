@@ -3,6 +3,7 @@
 #include "frame_items.h"
 #include "frame_properties.h"
 #include "kvsvplatform.h"
+#include "signal_properties.h"
 
 namespace nKvorSim {
 
@@ -40,8 +41,24 @@ Arrival ArrivalAt(const SessionDefinition &writer, bool echo, uint32_t receiverI
 
 }  // namespace
 
+bool ReceivesFrames(const Session &session) {
+  const SessionDefinition &definition = session.Definition();
+  if (session.ErrorStatus() != 0) return false;
+  if (IsFrameInputMode(definition.mode)) return true;
+  return definition.signals != nullptr && IsSignalInputMode(definition.mode);
+}
+
 void ReceiveFrame(Session &receiver, const Frame &frame) {
   const SessionDefinition &definition = receiver.Definition();
+  if (IsSignalInputMode(definition.mode)) {
+    if (definition.signals == nullptr) return;
+    const uint32_t count = static_cast<uint32_t>(definition.items.size());
+    const uint32_t capacity = SignalQueueCapacity(receiver);
+    definition.signals->Decode(frame, [&](uint32_t index, double value) {
+      receiver.SignalsIn().Receive(count, index, frame.timestamp, value, capacity);
+    });
+    return;
+  }
   if (definition.mode != kvMode_FrameInSinglePoint) {
     receiver.Frames().Enqueue(frame, QueueCapacity(receiver));
     return;
@@ -56,22 +73,27 @@ void ReceiveFrame(Session &receiver, const Frame &frame) {
 
 void FrameBus::Transmit(const Session &writer, std::vector<Frame> frames, uint64_t now,
                         const SessionRegistry &sessions) {
+  for (Frame &frame : frames) {
+    frame.timestamp = now;
+    frame.sentAt = now;
+  }
+  TransmitStamped(writer, std::move(frames), sessions);
+}
+
+void FrameBus::TransmitStamped(const Session &writer, std::vector<Frame> frames,
+                               const SessionRegistry &sessions) {
   const SessionDefinition &from = writer.Definition();
   const uint32_t network = InterfaceAt(from.interfaceIndex).network;
   const bool alone = AloneOnNetwork(network);
   const bool echo = EchoEnabled(writer);
   const uint8_t echoFlag = EchoFlag(from.protocol);
   for (Frame &frame : frames) {
-    frame.timestamp = now;
-    frame.sentAt = now;
     frame.sequence = ++sequences_[network];
     frame.flags = static_cast<uint8_t>(frame.flags & ~echoFlag);
   }
   for (const std::shared_ptr<Session> &receiver : sessions.All()) {
     const SessionDefinition &to = receiver->Definition();
-    if (receiver->ErrorStatus() != 0 || to.network != from.network || !IsFrameInputMode(to.mode)) {
-      continue;
-    }
+    if (to.network != from.network || !ReceivesFrames(*receiver)) continue;
     const Arrival arrival = ArrivalAt(from, echo, to.interfaceIndex, alone);
     if (arrival == Arrival::kNone) continue;
     for (const Frame &frame : frames) {

@@ -18,8 +18,12 @@
 
 namespace nKvorSim {
 
+// Whether frames on the session's network reach it: frame input sessions, and signal input
+// sessions made with a database, which decode them.
+bool ReceivesFrames(const Session &session);
+
 // Puts `frame` into an input session as received: at the end of its queue, or as the latest frame
-// of each list item that names it.
+// of each list item that names it; a signal session takes the values of its signals.
 void ReceiveFrame(Session &receiver, const Frame &frame);
 
 class FrameBus {
@@ -28,6 +32,11 @@ class FrameBus {
   // transmission, and numbered on its network.
   void Transmit(const Session &writer, std::vector<Frame> frames, uint64_t now,
                 const SessionRegistry &sessions);
+  // Sends `frames` from `writer` at once, each stamped with the time it is due at, as its arrival
+  // and its transmission: signal writes that are scheduled reach their receivers ahead of time,
+  // and the receivers let the clock reach them.
+  void TransmitStamped(const Session &writer, std::vector<Frame> frames,
+                       const SessionRegistry &sessions);
   // Numbering starts again from 1.
   void Reset();
 

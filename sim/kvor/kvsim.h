@@ -46,8 +46,52 @@
  *                     handle returns that status and touches no output, except kvClear and
  *                     kvSystemClose, which end the error session and return 0.
  *   Signals           kvReadSignalSinglePoint needs mode 0, kvWriteSignalSinglePoint mode 3;
- *                     each buffer must hold 8 bytes per signal. Values travel over the session's
- *                     network by signal name (see kvsimSetSignalValues).
+ *                     each buffer must hold 8 bytes per signal. A session made with the database
+ *                     "" or ":memory:" carries its values over its network by signal name (see
+ *                     kvsimSetSignalValues); waveform and XY writes of such a session leave the
+ *                     last value of each signal there, and nothing reaches its waveform or XY
+ *                     reads.
+ *                     So does one whose database is neither an alias nor a file.
+ *                     A signal session made with any other database (an alias or a database file,
+ *                     see Databases) takes its signals from that database's cluster (the first
+ *                     for an empty cluster name; one of another name is kvsimErrObjectNotFound),
+ *                     copied when the session is made. Each list item
+ *                     is "frame.signal", or the name of a signal that no other frame of the
+ *                     cluster has (else kvCreateSession fails with kvsimErrObjectNotFound;
+ *                     kvsimErrSignalLayout for a signal that does not fit its frame). Values then
+ *                     travel in frames over the virtual bus, as frames of frame sessions do, and
+ *                     reach frame input sessions too:
+ *                     Output sessions (modes 3, 4, 5) encode values into the frames of their
+ *                     signals. Signals go in frame groups: the plain signals of a frame, or the
+ *                     multiplexed signals of one multiplexer value (the group's frame carries
+ *                     that value in its multiplexer). The session keeps each group's payload,
+ *                     which starts with every signal at its start value, so that a frame carries
+ *                     the latest value of every signal of its group. kvWriteSignalSinglePoint
+ *                     sends one frame per group of the list, stamped with the clock.
+ *                     kvWriteSignalXY sends each pair at its timestamp (the clock where none are
+ *                     given), kvhdnWriteSignalWaveform sample k at instant k of the session's
+ *                     grid at kvPropSession_ResampRate (8-byte float, default 1000.0 per second),
+ *                     which goes on from where the write before ended, or from the clock if that
+ *                     has passed; values of one group due at one time share a frame. Frames
+ *                     stamped ahead of the clock are delivered at once with their stamps.
+ *                     Input sessions (modes 0, 1, 2) decode each frame that reaches them (as a
+ *                     frame input session on the same interface would receive it): each signal
+ *                     whose frame it is, whose bits all came, and, if multiplexed, whose
+ *                     multiplexer holds its value, arrives as a value stamped with the frame's
+ *                     time. kvReadSignalSinglePoint serves all three modes with the latest value.
+ *                     kvReadSignalXY (mode 2) hands out the pairs of each signal that no read has
+ *                     taken, oldest first; kvhdnReadSignalWaveform (mode 1) resamples the values at
+ *                     kvPropSession_ResampRate on a grid that starts when the session is made.
+ *                     Each signal keeps up to kvPropSession_QueueSize pairs (4-byte, default 4096)
+ *                     until read; a pair that finds them full is dropped. A flush forgets values
+ *                     and pairs and starts the grid again at the clock. The time rules of each
+ *                     read are in sim/kvor/signal_xy.h and signal_waveform.h; moving the clock
+ *                     wakes reads that wait for it. The sizes of the regions are those of the
+ *                     declarations in kvsvplatform.h; a region too small for the session's
+ *                     signals is kvsimErrBufferTooSmall, a missing one kvsimErrNullPointer, a NaN
+ *                     time limit or a resample rate that is not a positive number
+ *                     kvsimErrInvalidArgument, a pair count above the run length in a write
+ *                     kvsimErrInvalidArgument.
  *   Frames            Frame sessions are modes 6 to 8 (input stream, queued, single point) and
  *                     9 to 11 (output). A frame that an output session writes goes out at once,
  *                     stamped with the clock, and arrives at every frame input session on the
@@ -301,6 +345,10 @@ KVSIM_API void kvsimClearFailures(void);
  *   kvSetSubProperty         object                     identifier  size           index
  *   kvReadSignalSinglePoint  session                    0           values size    timestamps size
  *   kvWriteSignalSinglePoint session                    0           values size    0
+ *   kvhdnReadSignalWaveform  session                    0           buffer size    0
+ *   kvhdnWriteSignalWaveform session                    0           buffer size    0
+ *   kvReadSignalXY           session                    0           values size    counts size
+ *   kvWriteSignalXY          session                    0           values size    counts size
  *   kvStart                  session                    0           scope          0
  *   kvStop                   session                    0           scope          0
  *   kvFlush                  session                    0           0              0
@@ -395,6 +443,15 @@ KVSIM_API int32_t kvsimSetSignalValues(uint32_t session, const double *values, i
  * `max`; a signal never set reads 0.0). Returns the session's number of signals, or -1 as
  * kvsimSetSignalValues. */
 KVSIM_API int32_t kvsimGetSignalValues(uint32_t session, double *values, int32_t max);
+
+/* From now on the signal reads of the input session (modes 0, 1, 2) do nothing but fill what
+ * they are given, after their checks: value k of signal i is 1000 i + k, stamped with the clock
+ * plus k (raw time). kvReadSignalXY gives each signal min(run length, pairs) pairs,
+ * kvhdnReadSignalWaveform min(samples per buffer, pairs) samples starting at the clock at
+ * 1 / kvPropSession_ResampRate seconds, kvReadSignalSinglePoint value 0 of each. Nothing waits
+ * and nothing is taken from what arrived. A negative `pairs` ends it. Returns 0, or -1 for a
+ * session that is not a signal input session. */
+KVSIM_API int32_t kvsimSetSignalReadFill(uint32_t session, int32_t pairs);
 
 /* ==== Frames ================================================================================= */
 

@@ -1,7 +1,7 @@
 // One session of the driver: its definition, the properties set on it, the events its blocked
 // calls wait for, the terminal routes it connected, the point up to which it was flushed, and its
-// frame traffic. An error session has no definition and answers every use with the status it was
-// made with.
+// frame and signal traffic. An error session has no definition and answers every use with the
+// status it was made with.
 #ifndef KVOR_SIM_SESSION_H
 #define KVOR_SIM_SESSION_H
 
@@ -17,6 +17,8 @@
 #include "property_store.h"
 #include "session_definition.h"
 #include "session_events.h"
+#include "signal_inputs.h"
+#include "signal_outputs.h"
 #include "terminals.h"
 
 namespace nKvorSim {
@@ -41,6 +43,8 @@ class Session {
   const FrameInbox &Frames() const { return frames_; }
   FrameReadStream &ReadStream() { return readStream_; }
   FrameLastWrites &LastWrites() { return lastWrites_; }
+  SignalInputs &SignalsIn() { return signalsIn_; }
+  SignalOutputs &SignalsOut() { return signalsOut_; }
 
   // Signal values published on the network up to this publication number arrived before the
   // latest flush, and the session no longer holds them.
@@ -64,6 +68,8 @@ class Session {
   FrameInbox frames_;
   FrameReadStream readStream_;
   FrameLastWrites lastWrites_;
+  SignalInputs signalsIn_;
+  SignalOutputs signalsOut_;
   std::atomic<uint64_t> flushedThrough_{0};
   std::atomic<int64_t> linSchedule_{-1};  // -1: no schedule selected
 };

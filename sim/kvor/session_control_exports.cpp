@@ -63,6 +63,7 @@ KVOR_DRIVER_API int32_t kvFlush(uint32_t session) {
   return RunSessionCall(SessionCall("kvFlush", session), session, [&](Session &target) {
     target.MarkFlushed(target.Definition().network->LastPublication());
     target.Frames().Flush();
+    target.SignalsIn().Flush(Driver::Instance().Clock().Now());
     return Status{0};
   });
 }

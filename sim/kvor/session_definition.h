@@ -4,11 +4,13 @@
 #define KVOR_SIM_SESSION_DEFINITION_H
 
 #include <cstdint>
+#include <memory>
 #include <string>
 #include <vector>
 
 #include "driver_status.h"
 #include "network.h"
+#include "signal_layout.h"
 
 namespace nKvorSim {
 
@@ -23,6 +25,10 @@ struct SessionDefinition {
   std::string cluster;
   std::vector<std::string> items;  // signals or frames, trimmed, in list order
   Network *network = nullptr;      // the network of the interface
+  // Where the signals lie in frames, for a signal session made with a database; null for one
+  // whose values travel by name.
+  std::shared_ptr<const SignalLayout> signals;
+  uint64_t createdAt = 0;  // the clock when the session was made
 };
 
 // Checks the arguments of kvCreateSession and makes the definition. The interface is one of the

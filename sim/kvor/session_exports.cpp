@@ -7,6 +7,7 @@
 #include "driver_export.h"
 #include "kvsvplatform.h"
 #include "session_definition.h"
+#include "signal_layout.h"
 
 using namespace nKvorSim;
 
@@ -24,6 +25,10 @@ KVOR_DRIVER_API int32_t kvCreateSession(const char *database, const char *cluste
     Status status = MakeSessionDefinition(database, cluster, list, interfaceName, mode,
                                           driver.Networks(), &definition);
     if (status < 0) return status;
+    status = MakeSessionLayout(driver.Databases(), definition.database, definition.cluster,
+                               definition.mode, definition.items, &definition.signals);
+    if (status < 0) return status;
+    definition.createdAt = driver.Clock().Now();
     uint32_t handle = 0;
     status = driver.Sessions().Add(std::make_shared<Session>(std::move(definition)), &handle);
     if (status < 0) return status;

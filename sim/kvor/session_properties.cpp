@@ -7,6 +7,7 @@
 #include "kvorproperties.h"
 #include "kvsim.h"
 #include "property_value.h"
+#include "signal_properties.h"
 
 namespace nKvorSim {
 
@@ -42,7 +43,7 @@ std::optional<PropertyValue> DefinedProperty(const SessionDefinition &definition
   }
 }
 
-// Read-only values first, then what was set, then the defaults of frame sessions.
+// Read-only values first, then what was set, then the defaults of frame and signal sessions.
 std::optional<PropertyValue> ReadOnlyProperty(const Session &session, uint32_t id) {
   if (std::optional<PropertyValue> defined = DefinedProperty(session.Definition(), id)) {
     return defined;
@@ -53,7 +54,8 @@ std::optional<PropertyValue> ReadOnlyProperty(const Session &session, uint32_t i
 std::optional<PropertyValue> PropertyOf(const Session &session, uint32_t id) {
   if (std::optional<PropertyValue> fixed = ReadOnlyProperty(session, id)) return fixed;
   if (std::optional<PropertyValue> stored = session.Store().Get(id)) return stored;
-  return FrameDefaultProperty(session, id);
+  if (std::optional<PropertyValue> frame = FrameDefaultProperty(session, id)) return frame;
+  return SignalDefaultProperty(session, id);
 }
 
 Status CheckIndex(const Session &session, uint32_t index) {
