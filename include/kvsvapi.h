@@ -288,6 +288,110 @@ KVSV_EXPORT kvsvStatus kvsvReadFrameEthernetEx(uint32_t session, int32_t numFram
 KVSV_EXPORT kvsvStatus kvsvReadFrameRaw(uint32_t session, int32_t numBytes, SvHandle *data,
                                         double timeout);
 
+/* ---- Conversions --------------------------------------------------------------------------- */
+
+/* A conversion session (mode 12) packs signals into frames and back with no bus. Towards frames,
+ * `values` is the host double array of one value per signal, or `bytes` a host byte array (count
+ * at byte 0, bytes from byte 4) holding the signals' image; the frames go into `*frames` as into a
+ * frame read, with the payload handles that no frame takes kept in `*spareHandles` for later
+ * calls, or as records into the byte array `*rawFrames`. The first call sizes every host object
+ * for the session's frames; later calls only overwrite them.
+ * 0xBFF63020: no such session. 0xBFF63027: the session is in use by another call or closing.
+ * 0xBFF63160: `values` or `bytes` is null; the frames then go to the spares. 0xBFF630AF: the
+ * session's payload limit is beyond its protocol (CAN 64, J1939 1785, LIN 8). 0xBFF630B0: the
+ * host could not give an array or a handle. 0xBFF6309F: a frame longer than the session's limit
+ * was delivered cut to it. 0xBFF63001: no payload handle was left for a frame. 0xBFF63015: an
+ * array pointer is null. Otherwise the driver's status. The Ex forms return 0 at once, touching
+ * nothing, when `*skip` is non-zero. */
+KVSV_EXPORT kvsvStatus kvsvConvertSignalSinglePointToFrameRaw(uint32_t session, SvHandle *values,
+                                                              SvHandle *rawFrames);
+KVSV_EXPORT kvsvStatus kvsvConvertSignalSinglePointToFrameCAN(uint32_t session, SvHandle *values,
+                                                              SvHandle *frames,
+                                                              SvHandle *spareHandles);
+KVSV_EXPORT kvsvStatus kvsvConvertSignalSinglePointToFrameLIN(uint32_t session, SvHandle *values,
+                                                              SvHandle *frames,
+                                                              SvHandle *spareHandles);
+KVSV_EXPORT kvsvStatus kvsvConvertSignalSinglePointToFrameFlexRay(uint32_t session,
+                                                                  SvHandle *values,
+                                                                  SvHandle *frames,
+                                                                  SvHandle *spareHandles);
+KVSV_EXPORT kvsvStatus kvsvConvertSignalSinglePointToFrameCANEx(uint32_t session,
+                                                                SvHandle *values,
+                                                                SvHandle *frames,
+                                                                SvHandle *spareHandles,
+                                                                const uint8_t *skip);
+KVSV_EXPORT kvsvStatus kvsvConvertSignalSinglePointToFrameLINEx(uint32_t session,
+                                                                SvHandle *values,
+                                                                SvHandle *frames,
+                                                                SvHandle *spareHandles,
+                                                                const uint8_t *skip);
+KVSV_EXPORT kvsvStatus kvsvConvertSignalSinglePointToFrameFlexRayEx(uint32_t session,
+                                                                    SvHandle *values,
+                                                                    SvHandle *frames,
+                                                                    SvHandle *spareHandles,
+                                                                    const uint8_t *skip);
+KVSV_EXPORT kvsvStatus kvsvConvertByteArraySinglePointToFrameRaw(uint32_t session,
+                                                                 SvHandle *bytes,
+                                                                 SvHandle *rawFrames);
+KVSV_EXPORT kvsvStatus kvsvConvertByteArraySinglePointToFrameCAN(uint32_t session,
+                                                                 SvHandle *bytes,
+                                                                 SvHandle *frames,
+                                                                 SvHandle *spareHandles);
+KVSV_EXPORT kvsvStatus kvsvConvertByteArraySinglePointToFrameLIN(uint32_t session,
+                                                                 SvHandle *bytes,
+                                                                 SvHandle *frames,
+                                                                 SvHandle *spareHandles);
+KVSV_EXPORT kvsvStatus kvsvConvertByteArraySinglePointToFrameFlexRay(uint32_t session,
+                                                                     SvHandle *bytes,
+                                                                     SvHandle *frames,
+                                                                     SvHandle *spareHandles);
+KVSV_EXPORT kvsvStatus kvsvConvertByteArraySinglePointToFrameCANEx(uint32_t session,
+                                                                   SvHandle *bytes,
+                                                                   SvHandle *frames,
+                                                                   SvHandle *spareHandles,
+                                                                   const uint8_t *skip);
+KVSV_EXPORT kvsvStatus kvsvConvertByteArraySinglePointToFrameLINEx(uint32_t session,
+                                                                   SvHandle *bytes,
+                                                                   SvHandle *frames,
+                                                                   SvHandle *spareHandles,
+                                                                   const uint8_t *skip);
+KVSV_EXPORT kvsvStatus kvsvConvertByteArraySinglePointToFrameFlexRayEx(uint32_t session,
+                                                                       SvHandle *bytes,
+                                                                       SvHandle *frames,
+                                                                       SvHandle *spareHandles,
+                                                                       const uint8_t *skip);
+
+/* Away from frames: the host's clusters in `*frames` (or records in the byte array `*rawFrames`)
+ * go to the driver, which extracts one value per signal into `*values`, or the signals' image
+ * into `*bytes`, created or grown as needed. No frames is status 0 with nothing touched, on any
+ * session. After success the count is the session's number of signals, or its image size in
+ * bytes; after a failure past the session checks it is 0.
+ * 0xBFF6309F: a frame longer than the session's limit; nothing goes to the driver. 0xBFF630AF,
+ * 0xBFF630B0, 0xBFF63020, 0xBFF63027, 0xBFF63015 as towards frames; 0xBFF63010: no memory for
+ * the records. Otherwise the driver's status. */
+KVSV_EXPORT kvsvStatus kvsvConvertFrameRawToSignalSinglePoint(uint32_t session,
+                                                              SvHandle *rawFrames,
+                                                              SvHandle *values);
+KVSV_EXPORT kvsvStatus kvsvConvertFrameCANToSignalSinglePoint(uint32_t session, SvHandle *frames,
+                                                              SvHandle *values);
+KVSV_EXPORT kvsvStatus kvsvConvertFrameLINToSignalSinglePoint(uint32_t session, SvHandle *frames,
+                                                              SvHandle *values);
+KVSV_EXPORT kvsvStatus kvsvConvertFrameFlexRayToSignalSinglePoint(uint32_t session,
+                                                                  SvHandle *frames,
+                                                                  SvHandle *values);
+KVSV_EXPORT kvsvStatus kvsvConvertFrameRawToByteArraySinglePoint(uint32_t session,
+                                                                 SvHandle *rawFrames,
+                                                                 SvHandle *bytes);
+KVSV_EXPORT kvsvStatus kvsvConvertFrameCANToByteArraySinglePoint(uint32_t session,
+                                                                 SvHandle *frames,
+                                                                 SvHandle *bytes);
+KVSV_EXPORT kvsvStatus kvsvConvertFrameLINToByteArraySinglePoint(uint32_t session,
+                                                                 SvHandle *frames,
+                                                                 SvHandle *bytes);
+KVSV_EXPORT kvsvStatus kvsvConvertFrameFlexRayToByteArraySinglePoint(uint32_t session,
+                                                                     SvHandle *frames,
+                                                                     SvHandle *bytes);
+
 /* ---- Signals ------------------------------------------------------------------------------- */
 
 /* Reads the latest value of every signal of `session` into the host double array `*values`
@@ -299,6 +403,85 @@ KVSV_EXPORT kvsvStatus kvsvReadSignalSinglePoint(uint32_t session, SvHandle *val
 
 /* Writes one value per signal of `session` from the host double array `values`. */
 KVSV_EXPORT kvsvStatus kvsvWriteSignalSinglePoint(uint32_t session, SvHandle values);
+
+/* A waveform of the host's waveform array, as Lock describes it (80 bytes). */
+typedef struct SvWaveformDescriptor {
+  SvTime t0;                    /* time of the first sample */
+  double dt;                    /* seconds between samples */
+  uint8_t reserved24[8];
+  uint32_t numSamples;
+  uint8_t reserved36[12];
+  double *samples;              /* the waveform's own sample storage */
+  uint8_t reserved56[24];
+} SvWaveformDescriptor;
+
+typedef struct SvWaveformArray SvWaveformArray;
+
+/* The host's table of operations of a waveform array. The library calls only the four named
+ * ones, at their fixed positions; each returns 0 on success. */
+typedef struct SvWaveformArrayOps {
+  void (*reserved0[3])(void);
+  /* 3: the number of waveforms into *count. */
+  int32_t (*GetCount)(SvWaveformArray *self, int32_t *count);
+  void (*reserved4[2])(void);
+  /* 6: makes the array `count` waveforms of `numSamples` samples; `kind` is always 6. */
+  int32_t (*Resize)(SvWaveformArray *self, int32_t kind, int32_t count, int32_t numSamples);
+  void (*reserved7[4])(void);
+  /* 11: opens the first `count` waveforms, `access` 2 to fill them or 1 to take their samples,
+   * and describes each in descriptors[i]. */
+  int32_t (*Lock)(SvWaveformArray *self, int32_t access, int32_t count,
+                  SvWaveformDescriptor *descriptors);
+  /* 12: closes them again, keeping the t0 and dt written into the descriptors. Called also after
+   * a Lock that failed. */
+  int32_t (*Unlock)(SvWaveformArray *self, int32_t count, SvWaveformDescriptor *descriptors);
+} SvWaveformArrayOps;
+
+/* The host's waveform array: an object that starts with its table of operations. */
+struct SvWaveformArray {
+  const SvWaveformArrayOps *ops;
+};
+
+/* Reads `numSamples` evenly spaced samples of every signal of `session` straight into the
+ * waveforms of `waveforms`, which is resized to one waveform per signal when the number of
+ * signals or of samples changed. All waveforms get the driver's start time and interval; a read
+ * that comes back short cuts the waveforms to what the driver had. A negative `numSamples` asks
+ * for up to 10000 samples and needs a timeout of 0.0. A timeout other than 0.0 (seconds; NaN
+ * too) registers kvsvSessionAbort as the program's clean-up before the driver may block.
+ * 0xBFF63020, 0xBFF63027: as for kvsvReadSignalSinglePoint, array untouched. 0xBFF630A0: negative
+ * `numSamples` with a timeout. 0xBFF630B0: the host refused to resize or lock the array.
+ * 0xBFF63015: `waveforms` is null. After a failure before the driver call the array is empty. */
+KVSV_EXPORT kvsvStatus kvsvReadSignalWaveform(uint32_t session, int32_t numSamples,
+                                              SvWaveformArray *waveforms, double timeout);
+
+/* Writes the samples of `waveforms`, one waveform per signal of `session`, every waveform cut to
+ * the shortest. 0xBFF63160: the array does not hold one waveform per signal. 0xBFF63010: out of
+ * memory, or the host refused to lock the array. 0xBFF63015: `waveforms` is null. */
+KVSV_EXPORT kvsvStatus kvsvWriteSignalWaveform(uint32_t session, SvWaveformArray *waveforms,
+                                               double timeout);
+
+/* Reads value and timestamp pairs of every signal of `session` into `*clusters`, an array of one
+ * cluster per signal (count at byte 0; from byte 8, per signal, the handle of its timestamp array
+ * of SvTime, then the handle of its value array of doubles), made or grown as needed. At most
+ * `numSamples` pairs per signal; a negative `numSamples` stands for the session's queue size. In
+ * a signal input XY session a non-null `timeLimit` whose seconds are not 0 is passed to the
+ * driver, after kvsvSessionAbort has been registered as the program's clean-up; any other
+ * session reads the latest value of each signal with its time.
+ * 0xBFF63020, 0xBFF63027: nothing touched. 0xBFF630B0: the host refused to grow an array, or no
+ * scratch memory: the array is then empty. 0xBFF63015: `clusters` is null. A failed driver read
+ * leaves the arrays as the driver's buffers gave them. */
+KVSV_EXPORT kvsvStatus kvsvReadSignalXY(uint32_t session, int32_t numSamples,
+                                        const SvTime *timeLimit, SvHandle *clusters);
+
+/* kvsvReadSignalXY, unless *skip is non-zero: then 0, and nothing is touched. */
+KVSV_EXPORT kvsvStatus kvsvReadSignalXYEx(uint32_t session, int32_t numSamples,
+                                          const SvTime *timeLimit, SvHandle *clusters,
+                                          const uint8_t *skip);
+
+/* Writes the pairs of `clusters`, laid out as kvsvReadSignalXY fills them, one cluster per signal
+ * of `session`. If any timestamp array is not empty, each signal sends as many pairs as it has
+ * both values and timestamps for; otherwise it sends its values and the driver stamps them.
+ * 0xBFF63160: null handle or block, or not one cluster per signal. 0xBFF63010: out of memory. */
+KVSV_EXPORT kvsvStatus kvsvWriteSignalXY(uint32_t session, SvHandle clusters, double timeout);
 
 #ifdef __cplusplus
 }

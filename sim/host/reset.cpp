@@ -7,6 +7,7 @@
 #include "references.h"
 #include "run_mode.h"
 #include "svsim.h"
+#include "waveform_arrays.h"
 
 extern "C" {
 
@@ -19,6 +20,7 @@ uint64_t svsimReset(void) {
   svhost::ResetCleanups();
   svhost::ResetRunMode();
   svhost::ResetAppPath();
+  svhost::ResetWaveformArrays();
   return svhost::HandleStore::Instance().Live();
 }
 

@@ -29,6 +29,7 @@ extern "C" {
  * never an error code: the process aborts with a message naming the operation. */
 #define SVSIM_ERR_ARGUMENT 1
 #define SVSIM_ERR_MEMORY 2
+#define SVSIM_ERR_LOCK 3
 #define SVSIM_PRINTF_BAD_FORMAT (-1)
 #define SVSIM_PRINTF_NO_MEMORY (-2)
 #define SVSIM_REF_NOT_FOUND (-1)
@@ -80,6 +81,11 @@ void svsimFailAllocAt(uint32_t n);
 void svsimFailResizeAt(uint32_t n);
 /* Non-zero: every allocation and resize fails until called with 0. */
 void svsimFailAll(int32_t on);
+/* The `n`th Lock, or Unlock, of a waveform array from now fails (1: the next one), once, with
+ * SVSIM_ERR_LOCK. 0 disarms. svsimFailAll does not reach them: they are not allocations. A failed
+ * Lock opens nothing; a failed Unlock still closes the array. */
+void svsimFailWaveformLockAt(uint32_t n);
+void svsimFailWaveformUnlockAt(uint32_t n);
 /* Status that svSetHandleSizeClr gives when a resize fails; SVSIM_ERR_MEMORY by default. A negative
  * code stands in for a host that reports memory failures as negative numbers. */
 void svsimSetResizeError(int32_t code);
@@ -180,6 +186,46 @@ int32_t svsimEndProgramAsync(void);
 int32_t svsimJoinEndProgram(SvsimEndReport *report);
 /* svsimEndProgramAsync, then svsimJoinEndProgram. */
 int32_t svsimEndProgram(SvsimEndReport *report);
+
+/* ---- Waveform arrays -------------------------------------------------------------------------
+ * The host's waveform array (SvWaveformArray of kvsvapi.h), with its table of operations. Only
+ * positions 3 (GetCount), 6 (Resize), 11 (Lock) and 12 (Unlock) hold operations; the others are
+ * null. Each waveform keeps its samples in a handle of the memory manager: Resize makes, resizes
+ * (only waveforms whose sample count changes) and disposes of such handles, and these count and
+ * fail as any handle operation does (its result is then that operation's code, with the waveforms
+ * before the failing one already changed). Resize wants the constant 6 and counts that are not
+ * negative, else SVSIM_ERR_ARGUMENT. A new waveform has t0 zero and dt 1.0.
+ * Lock wants access 1 or 2, at most as many waveforms as there are and descriptors for them, else
+ * SVSIM_ERR_ARGUMENT. It fills each descriptor (t0, dt, numSamples, samples; the rest zero) and
+ * keeps the array locked until Unlock; a Lock of 0 waveforms opens nothing. Unlock keeps the t0
+ * and dt of each descriptor. An Unlock of an array that is not locked (after a failed Lock) is
+ * taken with 0 and counted (svsimStrayWaveformUnlocks). These stop the process with a message, as
+ * a dead handle does: an operation on an array that is not live, a Lock of a locked array, an
+ * Unlock of another number of waveforms than its Lock, and the disposal of a locked array. */
+
+/* A live array of `count` waveforms of `numSamples` samples each, all zero; null if a handle
+ * cannot be made. */
+SvWaveformArray *svsimMakeWaveformArray(int32_t count, int32_t numSamples);
+/* Disposes of the array and its sample handles. A null array does nothing. */
+void svsimDisposeWaveformArray(SvWaveformArray *waveforms);
+/* Number of waveforms. */
+int32_t svsimWaveformCount(const SvWaveformArray *waveforms);
+/* Copies up to `capacity` samples of waveform `index` into `samples` and its timing into the
+ * non-null `t0` and `dt`. Returns its sample count, or -1 for an index that is not there. */
+int32_t svsimWaveformRead(const SvWaveformArray *waveforms, int32_t index, double *samples,
+                          int32_t capacity, SvTime *t0, double *dt);
+/* Gives waveform `index` these `numSamples` samples (a resize of its handle if the count changes).
+ * 0, the failed resize's code, or -1 for a bad index or count, or a locked array. */
+int32_t svsimWaveformWrite(SvWaveformArray *waveforms, int32_t index, const double *samples,
+                           int32_t numSamples);
+/* 1 while a Lock of the array waits for its Unlock, else 0. */
+int32_t svsimWaveformLocked(const SvWaveformArray *waveforms);
+/* Calls of the operation at `position` of the table on this array since it was made. */
+uint64_t svsimWaveformCalls(const SvWaveformArray *waveforms, int32_t position);
+/* Unlocks of arrays that were not locked, since the last svsimReset. */
+uint64_t svsimStrayWaveformUnlocks(void);
+/* Waveform arrays made and not yet disposed of. */
+uint64_t svsimLiveWaveformArrays(void);
 
 /* ---- Host data for tests -------------------------------------------------------------------- */
 

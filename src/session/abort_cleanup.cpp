@@ -8,8 +8,12 @@ namespace nKVSVAPI100 {
 // Written as a negated equality so that NaN, which equals nothing, counts as a limit.
 bool MayBlock(double timeLimit) { return !(timeLimit == 0.0); }
 
+void RegisterAbort(uint32_t session) {
+  svSetCleanupProc(kvsvSessionAbort, session, kAbortCleanupMode);
+}
+
 void RegisterAbortIfBlocking(uint32_t session, double timeLimit) {
-  if (MayBlock(timeLimit)) svSetCleanupProc(kvsvSessionAbort, session, kAbortCleanupMode);
+  if (MayBlock(timeLimit)) RegisterAbort(session);
 }
 
 }  // namespace nKVSVAPI100

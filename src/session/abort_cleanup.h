@@ -13,6 +13,10 @@ constexpr int32_t kAbortCleanupMode = 6;
 // Whether a call with this time limit may block: any limit other than 0.0, NaN included.
 bool MayBlock(double timeLimit);
 
+// Registers kvsvSessionAbort for `session` with the host, before a driver call that may block.
+// The registration is never taken back, and its outcome is not looked at.
+void RegisterAbort(uint32_t session);
+
 // Registers kvsvSessionAbort for `session` with the host if the time limit may block. The
 // registration is never taken back, and its outcome is not looked at: the call goes on either way.
 void RegisterAbortIfBlocking(uint32_t session, double timeLimit);

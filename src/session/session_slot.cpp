@@ -10,8 +10,8 @@ namespace nKVSVAPI100 {
 void ClearSlot(tSessionSlot &slot) {
   std::free(slot.frameBuffer);
   if (slot.waveformScratch != nullptr) {
-    std::free(slot.waveformScratch->second);
-    std::free(slot.waveformScratch->first);
+    std::free(slot.waveformScratch->descriptors);
+    std::free(slot.waveformScratch->sampleBuffers);
     std::free(slot.waveformScratch);
   }
   std::free(slot.flexRayTimeCache);

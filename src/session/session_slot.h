@@ -5,6 +5,8 @@
 #include <atomic>
 #include <cstdint>
 
+#include "kvsvapi.h"
+
 namespace nKVSVAPI100 {
 
 class cNameList;
@@ -12,10 +14,11 @@ class cNameList;
 // "Not known": negative as a signed number, it fails every size test, so no further flag is needed.
 constexpr int32_t kUnknown = static_cast<int32_t>(0x87654321u);
 
-// Two sample arrays of a waveform call, each a malloc block.
+// What a waveform call hands to the host and the driver, one entry per signal; each array a
+// malloc block.
 struct tWaveformScratch {
-  void *first;
-  void *second;
+  double **sampleBuffers;             // where each waveform's samples lie, for the driver
+  SvWaveformDescriptor *descriptors;  // filled by the host's Lock
 };
 
 // Convert exports trust the cache only under their own tag: protocol digit, then direction.

@@ -14,11 +14,17 @@ Status PrepareValueArray(tSessionSlot &slot, uint32_t session, SvHandle *values)
     ZeroArrayCount(*values);
     return status;
   }
-  slot.requiredHandleSize = static_cast<uint32_t>(slot.cachedCount) * 8u + 8u;
+  slot.requiredHandleSize = ValueArrayBytes(static_cast<uint32_t>(slot.cachedCount));
   // The count stays cached: only the size test sends the next call back here.
   status = RemapOutputStatus(ResizeOrCreateHandle(values, slot.requiredHandleSize));
   if (status < 0) ZeroArrayCount(*values);
   return status;
+}
+
+Status FitSignalArray(SvHandle *array, uint32_t bytes) {
+  if (*array != nullptr && svGetHandleSize(*array) >= bytes) return 0;
+  DisposeHandle(array);
+  return RemapOutputStatus(ResizeOrCreateHandle(array, bytes));
 }
 
 }  // namespace nKVSVAPI100

@@ -79,8 +79,8 @@ TEST_F(SessionTable, DestroySlotFreesEverythingItOwns) {
   auto *slot = new tSessionSlot();
   slot->frameBuffer = std::malloc(64);
   slot->waveformScratch = static_cast<tWaveformScratch *>(std::malloc(sizeof(tWaveformScratch)));
-  slot->waveformScratch->first = std::malloc(16);
-  slot->waveformScratch->second = std::malloc(16);
+  slot->waveformScratch->sampleBuffers = static_cast<double **>(std::malloc(16));
+  slot->waveformScratch->descriptors = static_cast<SvWaveformDescriptor *>(std::malloc(160));
   slot->flexRayTimeCache = std::malloc(32);
   slot->sessionNameList = new cNameList("A,B");
   slot->nameList = new cNameList("S1");
