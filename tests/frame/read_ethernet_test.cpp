@@ -99,15 +99,19 @@ TEST_F(ReadEthernet, HandlesGoToSparesAndComeBackLastInFirstOutWithNoAllocation)
   EXPECT_EQ(kvsimCountCalls("kvhdnReadFrameEthernet"), 2);
   EXPECT_EQ(kvsimCountCalls("kvGetProperty"), 0);
 
-  // Spares taken for frames that do not come stay in their elements, above the count.
+  // A read of one hands elements 1 and 2 back in index order; spares taken for frames that do
+  // not come then stay in their elements, above the count, the top of the stack first.
   Send({Pattern(4, 7)});
   ASSERT_EQ(Read(1), 0);
+  ASSERT_EQ(Count(spares_), 2);
+  EXPECT_EQ(SpareAt(spares_, 0), third);
+  EXPECT_EQ(SpareAt(spares_, 1), second);
   Send({Pattern(4, 8)});
   ASSERT_EQ(Read(3), 0);
   EXPECT_EQ(Count(frames_), 1);
   EXPECT_EQ(Count(spares_), 0);
-  EXPECT_EQ(Payload(1), third);
-  EXPECT_EQ(Payload(2), second);
+  EXPECT_EQ(Payload(1), second);
+  EXPECT_EQ(Payload(2), third);
 }
 
 TEST_F(ReadEthernet, FailedReadEmptiesTheArrayIntoTheSpares) {
