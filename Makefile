@@ -6,7 +6,7 @@
 #             seed corpus in fuzz/corpus
 
 JOBS ?= $(shell nproc)
-DEPS := libboost-dev libgtest-dev libgmock-dev libbenchmark-dev cmake ninja-build g++ binutils \
+DEPS := libboost-dev pkg-config libgtest-dev libgmock-dev libbenchmark-dev cmake ninja-build g++ binutils \
         clang libclang-rt-14-dev
 CMAKE_FLAGS := -G Ninja -DKVSV_WERROR=ON
 
