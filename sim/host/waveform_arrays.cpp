@@ -4,6 +4,8 @@
 // is known while it lives, and each Lock is checked against its Unlock: a second Lock, an Unlock
 // of another number of waveforms or the disposal of a locked array stops the process, as using a
 // dead handle does.
+#include "waveform_arrays.h"
+
 #include <algorithm>
 #include <cstring>
 #include <mutex>
@@ -15,7 +17,6 @@
 #include "fault_plan.h"
 #include "handle_store.h"
 #include "svsim.h"
-#include "waveform_arrays.h"
 
 namespace {
 
@@ -150,9 +151,13 @@ int32_t Unlock(SvWaveformArray *self, int32_t count, SvWaveformDescriptor *descr
   return svhost::FaultPlan::Instance().UnlockFails() ? SVSIM_ERR_LOCK : 0;
 }
 
-const SvWaveformArrayOps kOperationTable = {
-    {nullptr, nullptr, nullptr}, GetCount, {nullptr, nullptr}, Resize,
-    {nullptr, nullptr, nullptr, nullptr}, Lock, Unlock};
+const SvWaveformArrayOps kOperationTable = {{nullptr, nullptr, nullptr},
+                                            GetCount,
+                                            {nullptr, nullptr},
+                                            Resize,
+                                            {nullptr, nullptr, nullptr, nullptr},
+                                            Lock,
+                                            Unlock};
 
 // The waveform `index` of a live array, or null.
 tWaveform *WaveformAt(tHostWaveformArray &array, int32_t index) {

@@ -60,12 +60,12 @@ KVOR_DRIVER_API int32_t kvhdnReadSignalWaveform(uint32_t session, double timeout
                                                 uint64_t *startTime, double *interval,
                                                 double *const *buffers, uint32_t bufferSize,
                                                 uint32_t *numSamples) {
-  return RunSignalCall(SignalCall("kvhdnReadSignalWaveform", session, bufferSize), session,
-                       [&](Driver &driver, Session &target) {
-                         const tWaveformRead read{startTime, interval, buffers, bufferSize,
-                                                  numSamples};
-                         return ReadSignalWaveform(driver, target, timeout, read);
-                       });
+  return RunSignalCall(
+      SignalCall("kvhdnReadSignalWaveform", session, bufferSize), session,
+      [&](Driver &driver, Session &target) {
+        const tWaveformRead read{startTime, interval, buffers, bufferSize, numSamples};
+        return ReadSignalWaveform(driver, target, timeout, read);
+      });
 }
 
 KVOR_DRIVER_API int32_t kvhdnWriteSignalWaveform(uint32_t session, double timeout,
@@ -77,14 +77,14 @@ KVOR_DRIVER_API int32_t kvhdnWriteSignalWaveform(uint32_t session, double timeou
                        });
 }
 
-KVOR_DRIVER_API int32_t kvReadSignalXY(uint32_t session, const uint64_t *timeLimit,
-                                       double *values, uint32_t valuesSize, uint64_t *timestamps,
+KVOR_DRIVER_API int32_t kvReadSignalXY(uint32_t session, const uint64_t *timeLimit, double *values,
+                                       uint32_t valuesSize, uint64_t *timestamps,
                                        uint32_t timestampsSize, uint32_t *numPairs,
                                        uint32_t numPairsSize) {
   return RunSignalCall(SignalCall("kvReadSignalXY", session, valuesSize, numPairsSize), session,
                        [&](Driver &driver, Session &target) {
-                         const tXYRegions regions{values,   valuesSize, timestamps,
-                                                  timestampsSize, numPairs, numPairsSize};
+                         const tXYRegions regions{values,         valuesSize, timestamps,
+                                                  timestampsSize, numPairs,   numPairsSize};
                          return ReadSignalXY(driver, target, timeLimit, regions);
                        });
 }
@@ -96,10 +96,10 @@ KVOR_DRIVER_API int32_t kvWriteSignalXY(uint32_t session, double timeout, const 
   return RunSignalCall(SignalCall("kvWriteSignalXY", session, valuesSize, numPairsSize), session,
                        [&](Driver &driver, Session &target) {
                          // The regions are only read: the driver never writes a caller's input.
-                         const tXYRegions regions{const_cast<double *>(values), valuesSize,
-                                                  const_cast<uint64_t *>(timestamps),
-                                                  timestampsSize, const_cast<uint32_t *>(numPairs),
-                                                  numPairsSize};
+                         const tXYRegions regions{
+                             const_cast<double *>(values),       valuesSize,
+                             const_cast<uint64_t *>(timestamps), timestampsSize,
+                             const_cast<uint32_t *>(numPairs),   numPairsSize};
                          return WriteSignalXY(driver, target, timeout, regions);
                        });
 }

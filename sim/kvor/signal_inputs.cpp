@@ -75,15 +75,15 @@ void SignalInputs::PrepareGrid(double rate, uint64_t origin) {
 }
 
 uint64_t SignalInputs::InstantAt(uint64_t index) const {
-  return grid_.start +
-         static_cast<uint64_t>(std::llround(static_cast<double>(index) * kRawPerSecond / grid_.rate));
+  return grid_.start + static_cast<uint64_t>(
+                           std::llround(static_cast<double>(index) * kRawPerSecond / grid_.rate));
 }
 
 uint64_t SignalInputs::DueLocked(uint64_t now) const {
   if (now < InstantAt(grid_.next)) return 0;
   // A first guess from the rate, then corrected so that rounding agrees with InstantAt.
-  uint64_t last = static_cast<uint64_t>(static_cast<double>(now - grid_.start) * grid_.rate /
-                                        kRawPerSecond);
+  uint64_t last =
+      static_cast<uint64_t>(static_cast<double>(now - grid_.start) * grid_.rate / kRawPerSecond);
   last = std::max(last, grid_.next);
   while (InstantAt(last + 1) <= now) ++last;
   while (last > grid_.next && InstantAt(last) > now) --last;

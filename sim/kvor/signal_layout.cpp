@@ -26,13 +26,13 @@ uint64_t StartBits(const tSignal &signal) {
   return PhysicalToRaw(rawDomain, signal.defaultRaw);
 }
 
-// The frame before any value is written into it: every signal that the multiplexer value
-// `selected` puts in the frame at its start value, the multiplexer holding `selected`.
+// The frame of a group before any value is written into it: every signal that the group's
+// multiplexer value selects (the multiplexer's own start value for plain signals) at its start
+// value, and the multiplexer holding that value.
 std::vector<uint8_t> StartPayload(const tFrame &frame, std::optional<uint32_t> muxValue) {
   std::vector<uint8_t> payload(frame.payloadLength, 0);
   const tSignal *multiplexer = FindMultiplexer(frame);
-  const bool muxUsable =
-      multiplexer != nullptr && SignalFits(*multiplexer, frame.payloadLength);
+  const bool muxUsable = multiplexer != nullptr && SignalFits(*multiplexer, frame.payloadLength);
   const uint64_t selected = muxValue ? *muxValue : muxUsable ? StartBits(*multiplexer) : 0;
   for (const tSignal &signal : frame.signals) {
     if (!SignalFits(signal, frame.payloadLength)) continue;
@@ -110,8 +110,8 @@ uint32_t SignalLayout::GroupOf(const tFrame &frame, const tSignal &signal) {
   for (uint32_t group = 0; group < groups_.size(); ++group) {
     if (groups_[group].frame == &frame && groups_[group].muxValue == muxValue) return group;
   }
-  groups_.push_back(tFrameGroup{&frame, RecordIdentifier(frame), muxValue,
-                                StartPayload(frame, muxValue)});
+  groups_.push_back(
+      tFrameGroup{&frame, RecordIdentifier(frame), muxValue, StartPayload(frame, muxValue)});
   return static_cast<uint32_t>(groups_.size() - 1);
 }
 

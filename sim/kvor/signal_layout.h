@@ -31,7 +31,7 @@ struct tSignalItem {
 struct tFrameGroup {
   const tFrame *frame = nullptr;
   uint32_t identifier = 0;
-  std::optional<uint32_t> muxValue;  // the multiplexer value of its signals; none for plain ones
+  std::optional<uint32_t> muxValue;   // the multiplexer value of its signals; none for plain ones
   std::vector<uint8_t> startPayload;  // every signal of the group at its start value
 };
 

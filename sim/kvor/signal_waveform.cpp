@@ -65,8 +65,8 @@ Status ReadSignalWaveform(Driver &driver, Session &session, double timeout,
   const uint64_t origin = definition.createdAt;
   auto due = [&] { return inputs.InstantsDue(driver.Clock().Now(), rate, origin); };
   if (timeout != 0.0 && due() < wanted) {
-    status = session.Events().WaitUntil([&] { return due() >= wanted; }, timeout,
-                                        driver.Blocked(), "kvhdnReadSignalWaveform");
+    status = session.Events().WaitUntil([&] { return due() >= wanted; }, timeout, driver.Blocked(),
+                                        "kvhdnReadSignalWaveform");
     if (status != 0) return status;
   }
   const uint32_t samples = static_cast<uint32_t>(std::min<uint64_t>(wanted, due()));
@@ -103,11 +103,12 @@ Status WriteSignalWaveform(Driver &driver, Session &session, double timeout,
   std::vector<tSignalEvent> events;
   events.reserve(uint64_t{samples} * count);
   for (uint32_t k = 0; k < samples; ++k) {
-    for (uint32_t i = 0; i < count; ++i) events.push_back(tSignalEvent{instant(k), i, buffers[i][k]});
+    for (uint32_t i = 0; i < count; ++i)
+      events.push_back(tSignalEvent{instant(k), i, buffers[i][k]});
   }
   outputs.WaveformReached(instant(samples));
-  driver.Bus().TransmitStamped(
-      session, outputs.Encode(*definition.signals, std::move(events)), driver.Sessions());
+  driver.Bus().TransmitStamped(session, outputs.Encode(*definition.signals, std::move(events)),
+                               driver.Sessions());
   return 0;
 }
 

@@ -110,9 +110,9 @@ Status WriteSignalXY(Driver &driver, Session &session, double timeout, const tXY
     PublishLast(definition, last, now);
     return 0;
   }
-  driver.Bus().TransmitStamped(
-      session, session.SignalsOut().Encode(*definition.signals, std::move(events)),
-      driver.Sessions());
+  driver.Bus().TransmitStamped(session,
+                               session.SignalsOut().Encode(*definition.signals, std::move(events)),
+                               driver.Sessions());
   return 0;
 }
 

@@ -78,7 +78,8 @@ class cXYRead {
     tXYCluster *clusters = Clusters(*clusters_);
     for (int32_t i = 0; i < slot_.cachedCount && status_ >= 0; ++i) {
       status_ = FitSignalArray(&clusters[i].values, ValueArrayBytes(Run()));
-      if (status_ >= 0) status_ = FitSignalArray(&clusters[i].timestamps, TimestampArrayBytes(Run()));
+      if (status_ >= 0)
+        status_ = FitSignalArray(&clusters[i].timestamps, TimestampArrayBytes(Run()));
     }
   }
 
@@ -128,7 +129,8 @@ class cXYRead {
                   pairs * sizeof(double));
       ArrayCount(clusters[i].timestamps) = static_cast<int32_t>(pairs);
       SvTime *times = ArrayData8<SvTime>(clusters[i].timestamps);
-      for (uint32_t k = 0; k < pairs; ++k) RawTimeToSvTime(&times[k], &regions.timestamps[offset + k]);
+      for (uint32_t k = 0; k < pairs; ++k)
+        RawTimeToSvTime(&times[k], &regions.timestamps[offset + k]);
     }
   }
 

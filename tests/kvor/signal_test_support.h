@@ -33,13 +33,13 @@ struct tSignalCase {
 // multiplexer values, whose bits overlap.
 inline const std::vector<tSignalCase> &TeslaSignals() {
   static const std::vector<tSignalCase> signals = {
-      {"DAS_steeringAngleRequest", -403.85, 0.1},  // big-endian, 15 bits, offset -1638.35
-      {"DAS_steeringControlCounter", 11, 1},       // big-endian, 4 bits, same frame
-      {"EPAS_sysStatus.EPAS_internalSAS", 123.4, 0.1},  // big-endian, 14 bits, offset -819.2
-      {"DI_torqueMotor", -312.25, 0.25},           // little-endian, signed 13 bits
-      {"DI_motorRPM", -16000, 1},                  // little-endian, signed 16 bits
-      {"UI_csaRoadCurvC2", -0.012345, 1e-6},       // little-endian, signed, tiny scale
-      {"UI_donDisableAutoWiperDuration", 5, 1},    // multiplexed, multiplexer value 0
+      {"DAS_steeringAngleRequest", -403.85, 0.1},          // big-endian, 15 bits, offset -1638.35
+      {"DAS_steeringControlCounter", 11, 1},               // big-endian, 4 bits, same frame
+      {"EPAS_sysStatus.EPAS_internalSAS", 123.4, 0.1},     // big-endian, 14 bits, offset -819.2
+      {"DI_torqueMotor", -312.25, 0.25},                   // little-endian, signed 13 bits
+      {"DI_motorRPM", -16000, 1},                          // little-endian, signed 16 bits
+      {"UI_csaRoadCurvC2", -0.012345, 1e-6},               // little-endian, signed, tiny scale
+      {"UI_donDisableAutoWiperDuration", 5, 1},            // multiplexed, multiplexer value 0
       {"UI_camBlockLaneCheckThreshold", 0.6348, 0.01587},  // multiplexed, value 1
   };
   return signals;
@@ -47,7 +47,8 @@ inline const std::vector<tSignalCase> &TeslaSignals() {
 
 inline std::string ListOf(const std::vector<tSignalCase> &signals) {
   std::string list;
-  for (const tSignalCase &signal : signals) list += (list.empty() ? "" : ",") + std::string(signal.name);
+  for (const tSignalCase &signal : signals)
+    list += (list.empty() ? "" : ",") + std::string(signal.name);
   return list;
 }
 

@@ -3,7 +3,7 @@
 // host data are left consistent (the waveform array unlocked and cut to what the driver gave).
 #include <thread>
 
-#include "signal/xy_arrays.h"
+#include "signal/signal_test_support.h"
 #include "support/session_helpers.h"
 #include "support/slot_fixture.h"
 

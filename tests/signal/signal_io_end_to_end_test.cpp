@@ -7,7 +7,7 @@
 #include <vector>
 
 #include "kvor/signal_test_support.h"
-#include "signal/xy_arrays.h"
+#include "signal/signal_test_support.h"
 #include "support/slot_fixture.h"
 
 namespace {

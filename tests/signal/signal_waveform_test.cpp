@@ -5,23 +5,20 @@
 
 #include <climits>
 #include <cmath>
+#include <iterator>
 #include <vector>
 
-#include "kvsim.h"
-#include "kvsvapi.h"
-#include "signal/xy_arrays.h"
+#include "signal/signal_test_support.h"
 #include "support/fake_error_log.h"
 #include "support/slot_fixture.h"
-#include "svsim.h"
 
 namespace {
 
 using namespace kvsvtest;
 using nKVSVAPI100::kUnknown;
 
-constexpr int32_t kDriverFault = -1074388990;
 constexpr uint64_t kNow = 30000000;  // 3 s, raw
-constexpr int32_t kResize = 6, kLock = 11, kUnlock = 12;
+constexpr int32_t kResize = 6;       // the position of the array's Resize
 
 struct tWaveform {
   std::vector<double> samples;
@@ -47,14 +44,8 @@ std::vector<double> Filled(uint32_t signal, uint32_t samples) {
   return values;
 }
 
-kvsimCallRecord LastCall(const char *function) {
-  kvsimCallRecord record{};
-  for (int32_t i = kvsimLogCount() - 1; i >= 0; --i) {
-    if (kvsimLogEntry(i, &record) == 1 && std::string(record.function) == function) return record;
-  }
-  ADD_FAILURE() << "no call of " << function;
-  return record;
-}
+void FailDriverRead() { kvsimFailCall("kvhdnReadSignalWaveform", kDriverFault, 1); }
+void FailDriverWrite() { kvsimFailCall("kvhdnWriteSignalWaveform", kDriverFault, 1); }
 
 class WaveformTest : public SlotFixture {
  protected:
@@ -96,27 +87,23 @@ class SignalWaveformRead : public WaveformTest {
   SvWaveformArray *array_ = nullptr;
 };
 
-TEST_F(SignalWaveformRead, TheDriverFillsTheWaveformsAndAllShareItsStamps) {
+TEST_F(SignalWaveformRead, TheDriverFillsTheWaveformsAndSteadyReadsCostNothing) {
   ASSERT_EQ(Read(5), 0);
   ExpectShape(2, 5);
   for (int32_t i = 0; i < 2; ++i) {
     const tWaveform waveform = ReadWaveform(array_, i);
     EXPECT_EQ(waveform.samples, Filled(static_cast<uint32_t>(i), 5));
-    EXPECT_EQ(waveform.t0, kNow);
+    EXPECT_EQ(waveform.t0, kNow);  // one start time and interval for all
     EXPECT_EQ(waveform.dt, 1.0 / 1000);
   }
   EXPECT_EQ(LastCall("kvhdnReadSignalWaveform").size1, 40u);
   EXPECT_EQ(svsimCleanupRegistrations(), 0);
-}
-
-TEST_F(SignalWaveformRead, SteadyReadsNeitherResizeNorAllocateNorReadProperties) {
-  ASSERT_EQ(Read(8, 1.0), 0);
-  EXPECT_EQ(svsimCleanupRegistrations(), 1);
   const uint64_t resizes = svsimWaveformCalls(array_, kResize);
   svsimResetCounters();
   kvsimLogClear();
   kvsimSetClock(kNow + 77);
-  for (int i = 0; i < 3; ++i) ASSERT_EQ(Read(8, 1.0), 0);
+  for (int i = 0; i < 3; ++i) ASSERT_EQ(Read(5, 1.0), 0);
+  EXPECT_EQ(svsimCleanupRegistrations(), 3);
   EXPECT_EQ(svsimWaveformCalls(array_, kResize), resizes);
   EXPECT_EQ(svsimAllocCount() + svsimResizeCount() + svsimFreeCount(), 0u);
   EXPECT_EQ(kvsimLogCount(), 3);
@@ -170,19 +157,14 @@ TEST_F(SignalWaveformRead, FailuresLeaveTheArrayAsTheyShould) {
     const char *what;
     void (*arm)();
     kvsvStatus status;
-    int32_t count, samples;
-    bool driverCalled;
-    bool countForgotten;
+    int32_t count, samples;  // the array afterwards
+    bool driverCalled, countForgotten;
     uint64_t strayUnlocks;
   } cases[] = {
-      {"signal count", [] { kvsimFailProperty("kvGetProperty", kvPropSession_NumInList, kDriverFault, 1); },
-       kDriverFault, 0, 0, false, false, 0},
-      {"the host refuses to resize", [] { svsimFailAllocAt(1); }, kvErrOutputMemory, 0, 0, false,
-       true, 0},
-      {"the host refuses to lock", [] { svsimFailWaveformLockAt(1); }, kvErrOutputMemory, 2, 0,
-       false, false, 1},
-      {"the driver fails", [] { kvsimFailCall("kvhdnReadSignalWaveform", kDriverFault, 1); },
-       kDriverFault, 2, 0, true, false, 0},
+      {"signal count", FailSignalCount, kDriverFault, 0, 0, false, false, 0},
+      {"resize refused", FailFirstAllocation, kvErrOutputMemory, 0, 0, false, true, 0},
+      {"lock refused", FailFirstLock, kvErrOutputMemory, 2, 0, false, false, 1},
+      {"driver fails", FailDriverRead, kDriverFault, 2, 0, true, false, 0},
   };
   for (const Case &c : cases) {
     // A read that succeeds, then a new array: its count sends the next read to the sizing.
@@ -214,10 +196,8 @@ TEST_F(SignalWaveformRead, HostFailuresAfterTheDriverAreInternalErrors) {
     void (*arm)();
     int32_t fill;
     uint32_t line;
-  } cases[] = {
-      {"cutting a short read", [] { svsimFailResizeAt(1); }, 2, 464},
-      {"the unlock", [] { svsimFailWaveformUnlockAt(1); }, INT32_MAX, 490},
-  };
+  } cases[] = {{"cutting a short read", [] { svsimFailResizeAt(1); }, 2, 464},
+               {"the unlock", [] { svsimFailWaveformUnlockAt(1); }, INT32_MAX, 490}};
   for (const Case &c : cases) {
     ASSERT_EQ(Read(4), 0) << c.what;
     ASSERT_EQ(kvsimSetSignalReadFill(session_, c.fill), 0);
@@ -257,7 +237,7 @@ class SignalWaveformWrite : public WaveformTest {
   uint32_t writer_ = 0;
 };
 
-TEST_F(SignalWaveformWrite, EveryWaveformIsCutToTheShortest) {
+TEST_F(SignalWaveformWrite, EveryWaveformIsCutToTheShortestAndSteadyWritesCostNothing) {
   struct Case {
     std::vector<int32_t> lengths;
     uint32_t bufferSize;
@@ -266,57 +246,47 @@ TEST_F(SignalWaveformWrite, EveryWaveformIsCutToTheShortest) {
                {{4, 0, 4}, 0, {6, 16, 26}}};  // nothing sent: the values before stay
   for (const Case &c : cases) {
     SvWaveformArray *array = Waveforms(c.lengths);
-    ASSERT_EQ(kvsvWriteSignalWaveform(writer_, array, 0.0), 0);
+    ASSERT_EQ(kvsvWriteSignalWaveform(writer_, array, 2.0), 0);
     EXPECT_EQ(LastCall("kvhdnWriteSignalWaveform").size1, c.bufferSize);
     EXPECT_EQ(Sent(), c.sent);
     EXPECT_EQ(svsimWaveformLocked(array), 0);
+    svsimResetCounters();
+    kvsimLogClear();
+    ASSERT_EQ(kvsvWriteSignalWaveform(writer_, array, 0.0), 0);
+    EXPECT_EQ(kvsimLogCount(), 1);  // no property read
+    EXPECT_EQ(svsimAllocCount() + svsimResizeCount(), 0u);
   }
+  EXPECT_EQ(svsimCleanupRegistrations(), 2);
   // Without waveforms the count stays at its start, and its bytes wrap.
   const uint32_t none = MakeSession("", kvMode_SignalOutWaveform);
   ASSERT_EQ(kvsvWriteSignalWaveform(none, Array(), 0.0), 0);
   EXPECT_EQ(LastCall("kvhdnWriteSignalWaveform").size1, 0xFFFFFFF8u);
 }
 
-TEST_F(SignalWaveformWrite, SteadyWritesReadNoPropertyAndAllocateNothing) {
-  SvWaveformArray *array = Waveforms({5, 5, 5});
-  ASSERT_EQ(kvsvWriteSignalWaveform(writer_, array, 2.0), 0);
-  EXPECT_EQ(svsimCleanupRegistrations(), 1);
-  svsimResetCounters();
-  kvsimLogClear();
-  for (int i = 0; i < 3; ++i) ASSERT_EQ(kvsvWriteSignalWaveform(writer_, array, 0.0), 0);
-  EXPECT_EQ(kvsimLogCount(), 3);
-  EXPECT_EQ(svsimAllocCount() + svsimResizeCount(), 0u);
-}
-
 TEST_F(SignalWaveformWrite, FailuresForgetTheSignalCount) {
   struct Case {
-    const char *what;
     std::vector<int32_t> lengths;
     void (*arm)();
     kvsvStatus status;
-    bool driverCalled;
+    int32_t driverCalls;
     uint64_t strayUnlocks;
   } cases[] = {
-      {"two waveforms for three signals", {3, 3}, [] {}, kvErrElementCountMismatch, false, 0},
-      {"signal count", {3, 3, 3},
-       [] { kvsimFailProperty("kvGetProperty", kvPropSession_NumInList, kDriverFault, 1); },
-       kDriverFault, false, 0},
-      {"the host refuses to lock", {3, 3, 3}, [] { svsimFailWaveformLockAt(1); }, kvErrOutOfMemory,
-       false, 1},
-      {"the driver fails", {3, 3, 3},
-       [] { kvsimFailCall("kvhdnWriteSignalWaveform", kDriverFault, 1); }, kDriverFault, true, 0},
+      {{3, 3}, NoFailure, kvErrElementCountMismatch, 0, 0},  // two waveforms for three signals
+      {{3, 3, 3}, FailSignalCount, kDriverFault, 0, 0},
+      {{3, 3, 3}, FailFirstLock, kvErrOutOfMemory, 0, 1},
+      {{3, 3, 3}, FailDriverWrite, kDriverFault, 1, 0},
   };
-  for (const Case &c : cases) {
+  for (size_t i = 0; i < std::size(cases); ++i) {
+    const Case &c = cases[i];
     SvWaveformArray *array = Waveforms(c.lengths);
     const int32_t driverWrites = kvsimCountCalls("kvhdnWriteSignalWaveform");
     const uint64_t stray = svsimStrayWaveformUnlocks();
     c.arm();
-    EXPECT_EQ(kvsvWriteSignalWaveform(writer_, array, 0.0), c.status) << c.what;
-    EXPECT_EQ(kvsimCountCalls("kvhdnWriteSignalWaveform") - driverWrites, c.driverCalled ? 1 : 0)
-        << c.what;
-    EXPECT_EQ(svsimStrayWaveformUnlocks() - stray, c.strayUnlocks) << c.what;
-    EXPECT_EQ(Slot(writer_)->cachedCount, kUnknown) << c.what;
-    EXPECT_EQ(svsimWaveformLocked(array), 0) << c.what;
+    EXPECT_EQ(kvsvWriteSignalWaveform(writer_, array, 0.0), c.status) << i;
+    EXPECT_EQ(kvsimCountCalls("kvhdnWriteSignalWaveform") - driverWrites, c.driverCalls) << i;
+    EXPECT_EQ(svsimStrayWaveformUnlocks() - stray, c.strayUnlocks) << i;
+    EXPECT_EQ(Slot(writer_)->cachedCount, kUnknown) << i;
+    EXPECT_EQ(svsimWaveformLocked(array), 0) << i;
     strayUnlocks_ += c.strayUnlocks;
   }
   kvsvtest::cFakeErrorLog log;
