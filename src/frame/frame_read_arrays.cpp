@@ -37,16 +37,26 @@ bool cFrameArrays::FitCache(const tSessionSlot &slot, int32_t n, bool sparesRequ
 }
 
 Status cFrameArrays::SizeFor(tSessionSlot &slot, int32_t n) {
-  const uint64_t frameBytes = ArrayBytes(n, shape_.size);
-  const uint64_t spareBytes = ArrayBytes(n, sizeof(SvHandle));
-  if (frameBytes == 0 || spareBytes == 0) return kvErrOutputMemory;
-  slot.requiredHandleSize = static_cast<uint32_t>(frameBytes);
-  Status status = EnsureOutputSize(frames_, frameBytes);
+  if (ArrayBytes(n, sizeof(SvHandle)) == 0) return kvErrOutputMemory;
+  Status status = SizeFrames(slot, n);
   if (status < 0) return status;
-  status = EnsureOutputSize(spares_, spareBytes);
+  status = SizeSpares(n);
   if (status < 0) return status;
   slot.cachedCount = n;
   return 0;
+}
+
+Status cFrameArrays::SizeFrames(tSessionSlot &slot, int32_t n) {
+  const uint64_t bytes = ArrayBytes(n, shape_.size);
+  if (bytes == 0) return kvErrOutputMemory;
+  slot.requiredHandleSize = static_cast<uint32_t>(bytes);
+  return EnsureOutputSize(frames_, bytes);
+}
+
+Status cFrameArrays::SizeSpares(int32_t n) {
+  const uint64_t bytes = ArrayBytes(n, sizeof(SvHandle));
+  if (bytes == 0) return kvErrOutputMemory;
+  return EnsureOutputSize(spares_, bytes);
 }
 
 Status cFrameArrays::Provide(int32_t n, uint64_t &capacity, uint64_t payloadBytes,

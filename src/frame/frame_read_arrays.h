@@ -66,6 +66,10 @@ class cFrameArrays {
   // Creates or grows both arrays for `n` frames and records `n` as the slot's cached count. A
   // refusal of the host is 0xBFF630B0.
   Status SizeFor(tSessionSlot &slot, int32_t n);
+  // The two halves of SizeFor, for callers that do more between them: the frames array, whose
+  // size becomes the slot's requiredHandleSize, and the spares.
+  Status SizeFrames(tSessionSlot &slot, int32_t n);
+  Status SizeSpares(int32_t n);
 
   // Gives the arrays `n` payload handles between them. If `capacity` is under `payloadBytes`,
   // every existing handle is first resized to `payloadBytes` (a null place gets a new one; a

@@ -5,8 +5,8 @@
 #include "frame/ex_skip.h"
 #include "frame/frame_buffer.h"
 #include "frame/frame_record.h"
-#include "frame/frame_record_walk.h"
 #include "frame/record_frame_read.h"
+#include "frame/record_unpack.h"
 #include "kvsvapi.h"
 #include "kvsvplatform.h"
 
@@ -101,26 +101,11 @@ struct tCan {
                           static_cast<uint32_t>(n), timeout, &bytes);
   }
 
-  static bool Decodes(const tSessionSlot &slot) {
-    return slot.frameKind >= kFrameKindClassic && slot.frameKind <= kFrameKindJ1939;
-  }
+  static bool Decodes(const tSessionSlot &slot) { return UnpacksCanKind(slot); }
 
   static int32_t Walk(const tSessionSlot &slot, const cFrameArrays &arrays, uint32_t bytes,
                       Status &status) {
-    auto *records = static_cast<uint8_t *>(slot.frameBuffer);
-    const uint32_t size = slot.frameBufferSize;
-    const int32_t max = slot.cachedSamples;
-    switch (slot.frameKind) {
-      case kFrameKindClassic:
-        return WalkRecords<eRecordForm::kFixed, ePayloadRule::kClip, DecodeCanRecord>(
-            arrays, records, bytes, size, max, status);
-      case kFrameKindFd:
-        return WalkRecords<eRecordForm::kVariable, ePayloadRule::kClip, DecodeCanRecord>(
-            arrays, records, bytes, size, max, status);
-      default:
-        return WalkRecords<eRecordForm::kVariable, ePayloadRule::kGrow, DecodeCanRecord>(
-            arrays, records, bytes, size, max, status);
-    }
+    return UnpackCanRecords(slot, arrays, bytes, status, {__LINE__, __LINE__, __LINE__});
   }
 };
 

@@ -3,8 +3,8 @@
 #include "frame/ex_skip.h"
 #include "frame/frame_buffer.h"
 #include "frame/frame_record.h"
-#include "frame/frame_record_walk.h"
 #include "frame/record_frame_read.h"
+#include "frame/record_unpack.h"
 #include "kvsvapi.h"
 #include "kvsvplatform.h"
 
@@ -50,9 +50,7 @@ struct tFlexRay {
 
   static int32_t Walk(const tSessionSlot &slot, const cFrameArrays &arrays, uint32_t bytes,
                       Status &status) {
-    return WalkRecords<eRecordForm::kVariable, ePayloadRule::kClip, DecodeFlexRayRecord>(
-        arrays, static_cast<uint8_t *>(slot.frameBuffer), bytes, slot.frameBufferSize,
-        slot.cachedSamples, status);
+    return UnpackFlexRayRecords(slot, arrays, bytes, status, __LINE__);
   }
 };
 

@@ -3,8 +3,8 @@
 #include "frame/ex_skip.h"
 #include "frame/frame_buffer.h"
 #include "frame/frame_record.h"
-#include "frame/frame_record_walk.h"
 #include "frame/record_frame_read.h"
+#include "frame/record_unpack.h"
 #include "kvsvapi.h"
 #include "kvsvplatform.h"
 
@@ -43,9 +43,7 @@ struct tLin {
 
   static int32_t Walk(const tSessionSlot &slot, const cFrameArrays &arrays, uint32_t bytes,
                       Status &status) {
-    return WalkRecords<eRecordForm::kFixed, ePayloadRule::kClip, DecodeLinRecord>(
-        arrays, static_cast<uint8_t *>(slot.frameBuffer), bytes, slot.frameBufferSize,
-        slot.cachedSamples, status);
+    return UnpackLinRecords(slot, arrays, bytes, status, __LINE__);
   }
 };
 

@@ -27,10 +27,11 @@ using tRecordDecode = void (*)(const uint8_t *record, uint8_t *cluster);
 
 // Decodes the records of `records` (`bytes` of `bufferSize` filled) into the frames from element
 // 0 on: elements below the frames' count keep their own payload handle, later ones take a spare.
-// Updates `status` as the records demand and returns the number of frames delivered.
+// Updates `status` as the records demand and returns the number of frames delivered. A frame that
+// finds no spare left is reported as coming from `reportLine`.
 template <eRecordForm kForm, ePayloadRule kRule, tRecordDecode kDecode>
 int32_t WalkRecords(const cFrameArrays &arrays, uint8_t *records, uint32_t bytes,
-                    uint32_t bufferSize, int32_t payloadMax, Status &status) {
+                    uint32_t bufferSize, int32_t payloadMax, Status &status, uint32_t reportLine) {
   const int32_t owned = arrays.FrameCount();
   const uint32_t fixedRecords = bytes / kFixedRecordSize;
   uint32_t offset = 0;
@@ -53,7 +54,7 @@ int32_t WalkRecords(const cFrameArrays &arrays, uint8_t *records, uint32_t bytes
     if (i < owned) {
       payload = arrays.Payload(i);
     } else if (!arrays.TakeSpare(i, payload)) {
-      status = ReportInternalError(kComponentKvsvapi, nFile::kSessionIo, __LINE__, 0);
+      status = ReportInternalError(kComponentKvsvapi, nFile::kSessionIo, reportLine, 0);
       break;
     }
     kDecode(record, arrays.Element(i));

@@ -24,6 +24,7 @@
 #include "core/status.h"
 #include "frame/all_frames_count.h"
 #include "frame/frame_read_arrays.h"
+#include "frame/record_unpack.h"
 #include "kvsvapi.h"
 #include "session/abort_cleanup.h"
 #include "session/slot_guard.h"
@@ -59,12 +60,7 @@ Status ReadRecordFrames(uint32_t session, int32_t numFrames, SvHandle *frames,
     RegisterAbortIfBlocking(session, timeout);
     status = tProtocol::Read(slot, session, n, timeout, bytes);
   }
-  // Runs after a failure too, with no bytes: that empties the frames into the spares.
-  if (arrays.BothPresent() && slot.cachedSamples != 0 && tProtocol::Decodes(slot)) {
-    arrays.HandBack(tProtocol::Walk(slot, arrays, bytes, status));
-  }
-  // The next call goes through the growth again, where everything is checked anew.
-  if (status < 0) slot.cachedCount = kUnknown;
+  DeliverRecords<tProtocol>(slot, arrays, bytes, status);
   return status;
 }
 
