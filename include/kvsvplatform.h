@@ -123,6 +123,24 @@ int32_t kvhdnReadFrameEthernet(uint32_t session, void *descriptors, uint32_t num
 int32_t kvhdnWriteFrameEthernet(uint32_t session, const void *descriptors, uint32_t numFrames,
                                 double timeout);
 
+/* Conversion sessions (kvMode_SignalConversionSinglePoint) pack signals into frame records and
+ * back, with no bus. `frames` holds records in the session's form; sizes are in bytes. Values are
+ * one 64-bit float per signal; a byte image holds the signals' raw bits, kvPropHidden_ByteArrayBits
+ * of them. `timestamps` may be null (size 0); if not, it gets each signal's frame time. */
+int32_t kvConvertSignalsToFramesSinglePoint(uint32_t session, const double *values,
+                                            uint32_t valuesSize, void *frames,
+                                            uint32_t framesSize, uint32_t *bytesReturned);
+int32_t kvConvertFramesToSignalsSinglePoint(uint32_t session, const void *frames,
+                                            uint32_t framesSize, double *values,
+                                            uint32_t valuesSize, uint64_t *timestamps,
+                                            uint32_t timestampsSize);
+int32_t kvConvertByteArrayToFramesSinglePoint(uint32_t session, const uint8_t *bytes,
+                                              uint32_t bytesSize, void *frames,
+                                              uint32_t framesSize, uint32_t *bytesReturned);
+int32_t kvConvertFramesToByteArraySinglePoint(uint32_t session, const void *frames,
+                                              uint32_t framesSize, uint8_t *bytes,
+                                              uint32_t bytesSize);
+
 /* Databases. A database is opened by alias, by the path of a database file, or as ":memory:";
  * its objects (cluster, frame, signal, ECU, PDU) are found or created under a parent by class
  * (the class codes of the property identifiers: 0x10000 cluster, 0x20000 frame, 0x30000 signal,

@@ -37,6 +37,10 @@ constexpr DriverFunction kFunctions[] = {
     {"kvWriteFrame", true, false},
     {"kvhdnReadFrameEthernet", true, false},
     {"kvhdnWriteFrameEthernet", true, false},
+    {"kvConvertSignalsToFramesSinglePoint", true, false},
+    {"kvConvertFramesToSignalsSinglePoint", true, false},
+    {"kvConvertByteArrayToFramesSinglePoint", true, false},
+    {"kvConvertFramesToByteArraySinglePoint", true, false},
 };
 
 }  // namespace

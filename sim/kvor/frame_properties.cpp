@@ -17,14 +17,6 @@ constexpr uint32_t kEthernetPayloadMax = 1500;
 
 bool IsFrameMode(uint32_t mode) { return IsFrameInputMode(mode) || IsFrameOutputMode(mode); }
 
-// The value set on the session, or `fallback`. Sizes are checked when a value is set, so a stored
-// value of a 4-byte identifier has its 4 bytes.
-uint32_t SetU32(const Session &session, uint32_t id, uint32_t fallback) {
-  const std::optional<PropertyValue> stored = session.Store().Get(id);
-  if (!stored || stored->size() != sizeof(uint32_t)) return fallback;
-  return LoadU32(stored->data());
-}
-
 uint32_t DefaultPayloadLimit(const Session &session) {
   switch (session.Definition().protocol) {
     case kProtocolEthernet:
@@ -45,6 +37,12 @@ uint32_t DefaultQueueSize(const Session &session) {
 }
 
 }  // namespace
+
+uint32_t SetU32(const Session &session, uint32_t id, uint32_t fallback) {
+  const std::optional<PropertyValue> stored = session.Store().Get(id);
+  if (!stored || stored->size() != sizeof(uint32_t)) return fallback;
+  return LoadU32(stored->data());
+}
 
 bool IsFrameInputMode(uint32_t mode) {
   return mode == kvMode_FrameInStream || mode == kvMode_FrameInQueued ||

@@ -22,6 +22,10 @@ namespace nKvorSim {
 
 constexpr uint32_t kDefaultQueueFrames = 4096;
 
+// The value set on the session, or `fallback`. Sizes are checked when a value is set, so a stored
+// value of a 4-byte identifier has its 4 bytes.
+uint32_t SetU32(const Session &session, uint32_t id, uint32_t fallback);
+
 bool IsFrameInputMode(uint32_t mode);
 bool IsFrameOutputMode(uint32_t mode);
 

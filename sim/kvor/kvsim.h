@@ -154,6 +154,30 @@
  *                     Ethernet output sessions. Refused whole with kvsimErrInvalidFrame if a
  *                     descriptor's Length is above PayldLenMax, or its Data is 0 with a Length
  *                     that is not; Data 0 with Length 0 is an empty frame.
+ *   Conversions       Conversion sessions (mode 12) made with a database take their signals from
+ *                     it as signal sessions do (see Signals): the same list items, the same frame
+ *                     groups and the same encoding, with no bus. kvConvertSignalsToFramesSinglePoint
+ *                     gives, for one value per signal (8 bytes each), the frames that a signal
+ *                     output session of the same list would send for the same values at its
+ *                     first write, stamped with the clock, one per group in list order.
+ *                     kvConvertFramesToSignalsSinglePoint decodes the records given as a signal
+ *                     input session decodes what reaches it, a later frame over an earlier one; a
+ *                     signal that no record carries reads 0.0 (at time 0 in `timestamps`). The
+ *                     byte image of kvConvertByteArrayToFramesSinglePoint and
+ *                     kvConvertFramesToByteArraySinglePoint holds each signal's raw bits, low
+ *                     byte first, in whole bytes, one signal behind the other in list order.
+ *                     Records are of the session's form: variable for FlexRay and for CAN with a
+ *                     PayldLenMax above 8 (a frame longer than PayldLenMax goes out whole), fixed
+ *                     24-byte records otherwise (a longer frame keeps its first 8 bytes).
+ *                     Properties, settable: NumFrames (the groups of the list), PayldLenMax (LIN
+ *                     8, FlexRay 254, CAN 1785 with ApplicationProtocol 1, else the longest frame
+ *                     of the groups and at least 8), ApplicationProtocol (0), and the
+ *                     sub-property kvPropHidden_ByteArrayBits, the same at any index (the image's
+ *                     bits). Other modes: kvsimErrWrongMode. A session whose list names signals
+ *                     and that was made with no database to find them in: kvsimErrObjectNotFound.
+ *                     Buffers too small for what a call gives or takes: kvsimErrBufferTooSmall;
+ *                     records that are not whole records of the session's form, or a payload
+ *                     above PayldLenMax: kvsimErrInvalidFrame.
  *   kvStart, kvStop   Change what runs, by scope (enum kvsimScope): a session and its interface
  *                     each have a started state (kvsimSessionStarted, kvsimInterfaceStarted).
  *                     Sessions and interfaces begin stopped; starting what is started, or
@@ -364,6 +388,14 @@ KVSIM_API void kvsimClearFailures(void);
  *   kvWriteFrame             session                    0           size           0
  *   kvhdnReadFrameEthernet   session                    0           numFrames      0
  *   kvhdnWriteFrameEthernet  session                    0           numFrames      0
+ *   kvConvertSignalsToFramesSinglePoint
+ *                            session                    0           values size    frames size
+ *   kvConvertFramesToSignalsSinglePoint
+ *                            session                    0           frames size    values size
+ *   kvConvertByteArrayToFramesSinglePoint
+ *                            session                    0           image size     frames size
+ *   kvConvertFramesToByteArraySinglePoint
+ *                            session                    0           frames size    image size
  *
  * `text` holds the interface name of kvCreateSession, and "source -> destination" for
  * kvConnectTerminals and kvDisconnectTerminals (a null name as empty), cut to 63 bytes; it is

@@ -3,6 +3,7 @@
 #include <optional>
 #include <string>
 
+#include "conversion_properties.h"
 #include "frame_properties.h"
 #include "kvorproperties.h"
 #include "kvsim.h"
@@ -55,7 +56,8 @@ std::optional<PropertyValue> PropertyOf(const Session &session, uint32_t id) {
   if (std::optional<PropertyValue> fixed = ReadOnlyProperty(session, id)) return fixed;
   if (std::optional<PropertyValue> stored = session.Store().Get(id)) return stored;
   if (std::optional<PropertyValue> frame = FrameDefaultProperty(session, id)) return frame;
-  return SignalDefaultProperty(session, id);
+  if (std::optional<PropertyValue> signal = SignalDefaultProperty(session, id)) return signal;
+  return ConversionDefaultProperty(session, id);
 }
 
 Status CheckIndex(const Session &session, uint32_t index) {
@@ -89,10 +91,13 @@ Status SetSessionProperty(Session &session, uint32_t id, uint32_t size, const vo
 
 Status GetSessionSubProperty(const Session &session, uint32_t index, uint32_t id, uint32_t size,
                              void *value) {
-  const Status status = CheckIndex(session, index);
-  if (status < 0) return status;
   std::optional<PropertyValue> stored = session.Store().GetSub(index, id);
-  if (!stored) stored = FrameDefaultSubProperty(session, index, id);
+  if (!stored) stored = ConversionSessionSubProperty(session, id);
+  if (!stored) {
+    const Status status = CheckIndex(session, index);
+    if (status < 0) return status;
+    stored = FrameDefaultSubProperty(session, index, id);
+  }
   if (!stored) return kvsimErrPropertyUnknown;
   return CopyValueOut(*stored, size, value);
 }

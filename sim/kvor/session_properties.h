@@ -2,7 +2,7 @@
 // items, interface, protocol, database, cluster); any other identifier is stored as the bytes a
 // caller sets and read back as set, plainly or per item of the list. Frame sessions add the
 // defaults and live values of frame_properties.h, signal sessions the defaults of
-// signal_properties.h.
+// signal_properties.h, conversion sessions those of conversion_properties.h.
 #ifndef KVOR_SIM_SESSION_PROPERTIES_H
 #define KVOR_SIM_SESSION_PROPERTIES_H
 

@@ -52,7 +52,10 @@ const tFrame *FindFrame(const tCluster &cluster, const std::string &name) {
   return nullptr;
 }
 
-bool IsSignalMode(uint32_t mode) { return mode <= kvMode_SignalOutXY; }
+// Conversion sessions pack and unpack the same signals as the signal modes, with no bus.
+bool IsSignalMode(uint32_t mode) {
+  return mode <= kvMode_SignalOutXY || mode == kvMode_SignalConversionSinglePoint;
+}
 
 }  // namespace
 
