@@ -288,6 +288,110 @@ KVSV_EXPORT kvsvStatus kvsvReadFrameEthernetEx(uint32_t session, int32_t numFram
 KVSV_EXPORT kvsvStatus kvsvReadFrameRaw(uint32_t session, int32_t numBytes, SvHandle *data,
                                         double timeout);
 
+/* ---- Conversions --------------------------------------------------------------------------- */
+
+/* A conversion session (mode 12) packs signals into frames and back with no bus. Towards frames,
+ * `values` is the host double array of one value per signal, or `bytes` a host byte array (count
+ * at byte 0, bytes from byte 4) holding the signals' image; the frames go into `*frames` as into a
+ * frame read, with the payload handles that no frame takes kept in `*spareHandles` for later
+ * calls, or as records into the byte array `*rawFrames`. The first call sizes every host object
+ * for the session's frames; later calls only overwrite them.
+ * 0xBFF63020: no such session. 0xBFF63027: the session is in use by another call or closing.
+ * 0xBFF63160: `values` or `bytes` is null; the frames then go to the spares. 0xBFF630AF: the
+ * session's payload limit is beyond its protocol (CAN 64, J1939 1785, LIN 8). 0xBFF630B0: the
+ * host could not give an array or a handle. 0xBFF6309F: a frame longer than the session's limit
+ * was delivered cut to it. 0xBFF63001: no payload handle was left for a frame. 0xBFF63015: an
+ * array pointer is null. Otherwise the driver's status. The Ex forms return 0 at once, touching
+ * nothing, when `*skip` is non-zero. */
+KVSV_EXPORT kvsvStatus kvsvConvertSignalSinglePointToFrameRaw(uint32_t session, SvHandle *values,
+                                                              SvHandle *rawFrames);
+KVSV_EXPORT kvsvStatus kvsvConvertSignalSinglePointToFrameCAN(uint32_t session, SvHandle *values,
+                                                              SvHandle *frames,
+                                                              SvHandle *spareHandles);
+KVSV_EXPORT kvsvStatus kvsvConvertSignalSinglePointToFrameLIN(uint32_t session, SvHandle *values,
+                                                              SvHandle *frames,
+                                                              SvHandle *spareHandles);
+KVSV_EXPORT kvsvStatus kvsvConvertSignalSinglePointToFrameFlexRay(uint32_t session,
+                                                                  SvHandle *values,
+                                                                  SvHandle *frames,
+                                                                  SvHandle *spareHandles);
+KVSV_EXPORT kvsvStatus kvsvConvertSignalSinglePointToFrameCANEx(uint32_t session,
+                                                                SvHandle *values,
+                                                                SvHandle *frames,
+                                                                SvHandle *spareHandles,
+                                                                const uint8_t *skip);
+KVSV_EXPORT kvsvStatus kvsvConvertSignalSinglePointToFrameLINEx(uint32_t session,
+                                                                SvHandle *values,
+                                                                SvHandle *frames,
+                                                                SvHandle *spareHandles,
+                                                                const uint8_t *skip);
+KVSV_EXPORT kvsvStatus kvsvConvertSignalSinglePointToFrameFlexRayEx(uint32_t session,
+                                                                    SvHandle *values,
+                                                                    SvHandle *frames,
+                                                                    SvHandle *spareHandles,
+                                                                    const uint8_t *skip);
+KVSV_EXPORT kvsvStatus kvsvConvertByteArraySinglePointToFrameRaw(uint32_t session,
+                                                                 SvHandle *bytes,
+                                                                 SvHandle *rawFrames);
+KVSV_EXPORT kvsvStatus kvsvConvertByteArraySinglePointToFrameCAN(uint32_t session,
+                                                                 SvHandle *bytes,
+                                                                 SvHandle *frames,
+                                                                 SvHandle *spareHandles);
+KVSV_EXPORT kvsvStatus kvsvConvertByteArraySinglePointToFrameLIN(uint32_t session,
+                                                                 SvHandle *bytes,
+                                                                 SvHandle *frames,
+                                                                 SvHandle *spareHandles);
+KVSV_EXPORT kvsvStatus kvsvConvertByteArraySinglePointToFrameFlexRay(uint32_t session,
+                                                                     SvHandle *bytes,
+                                                                     SvHandle *frames,
+                                                                     SvHandle *spareHandles);
+KVSV_EXPORT kvsvStatus kvsvConvertByteArraySinglePointToFrameCANEx(uint32_t session,
+                                                                   SvHandle *bytes,
+                                                                   SvHandle *frames,
+                                                                   SvHandle *spareHandles,
+                                                                   const uint8_t *skip);
+KVSV_EXPORT kvsvStatus kvsvConvertByteArraySinglePointToFrameLINEx(uint32_t session,
+                                                                   SvHandle *bytes,
+                                                                   SvHandle *frames,
+                                                                   SvHandle *spareHandles,
+                                                                   const uint8_t *skip);
+KVSV_EXPORT kvsvStatus kvsvConvertByteArraySinglePointToFrameFlexRayEx(uint32_t session,
+                                                                       SvHandle *bytes,
+                                                                       SvHandle *frames,
+                                                                       SvHandle *spareHandles,
+                                                                       const uint8_t *skip);
+
+/* Away from frames: the host's clusters in `*frames` (or records in the byte array `*rawFrames`)
+ * go to the driver, which extracts one value per signal into `*values`, or the signals' image
+ * into `*bytes`, created or grown as needed. No frames is status 0 with nothing touched, on any
+ * session. After success the count is the session's number of signals, or its image size in
+ * bytes; after a failure past the session checks it is 0.
+ * 0xBFF6309F: a frame longer than the session's limit; nothing goes to the driver. 0xBFF630AF,
+ * 0xBFF630B0, 0xBFF63020, 0xBFF63027, 0xBFF63015 as towards frames; 0xBFF63010: no memory for
+ * the records. Otherwise the driver's status. */
+KVSV_EXPORT kvsvStatus kvsvConvertFrameRawToSignalSinglePoint(uint32_t session,
+                                                              SvHandle *rawFrames,
+                                                              SvHandle *values);
+KVSV_EXPORT kvsvStatus kvsvConvertFrameCANToSignalSinglePoint(uint32_t session, SvHandle *frames,
+                                                              SvHandle *values);
+KVSV_EXPORT kvsvStatus kvsvConvertFrameLINToSignalSinglePoint(uint32_t session, SvHandle *frames,
+                                                              SvHandle *values);
+KVSV_EXPORT kvsvStatus kvsvConvertFrameFlexRayToSignalSinglePoint(uint32_t session,
+                                                                  SvHandle *frames,
+                                                                  SvHandle *values);
+KVSV_EXPORT kvsvStatus kvsvConvertFrameRawToByteArraySinglePoint(uint32_t session,
+                                                                 SvHandle *rawFrames,
+                                                                 SvHandle *bytes);
+KVSV_EXPORT kvsvStatus kvsvConvertFrameCANToByteArraySinglePoint(uint32_t session,
+                                                                 SvHandle *frames,
+                                                                 SvHandle *bytes);
+KVSV_EXPORT kvsvStatus kvsvConvertFrameLINToByteArraySinglePoint(uint32_t session,
+                                                                 SvHandle *frames,
+                                                                 SvHandle *bytes);
+KVSV_EXPORT kvsvStatus kvsvConvertFrameFlexRayToByteArraySinglePoint(uint32_t session,
+                                                                     SvHandle *frames,
+                                                                     SvHandle *bytes);
+
 /* ---- Signals ------------------------------------------------------------------------------- */
 
 /* Reads the latest value of every signal of `session` into the host double array `*values`
