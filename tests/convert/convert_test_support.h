@@ -28,7 +28,7 @@ inline std::string HyundaiFdDbc() { return DbcPath("hyundai_canfd.dbc"); }
 struct tDbSignal {
   std::string item;  // "frame.signal"
   uint32_t numBits = 0;
-  uint32_t type = 0;  // 0 signed, 1 unsigned, 2 float
+  uint32_t type = 0;  // 0 signed, 1 unsigned
   double scale = 1.0;
   double offset = 0.0;
   bool multiplexed = false;
@@ -73,39 +73,14 @@ inline std::string ListOf(const std::vector<tDbSignal> &signals) {
 }
 
 // Raw bits that differ from signal to signal and fit each; small enough that a 64-bit raw value
-// survives the trip through a double.
+// survives the trip through a double. The field files have integer signals only.
 inline uint64_t RawFor(const tDbSignal &signal, size_t index) {
-  if (signal.type == 2) {
-    const float single = 1.25f * static_cast<float>(index % 7 + 1);
-    const double dbl = single;
-    uint64_t bits = 0;
-    if (signal.numBits == 32) {
-      uint32_t b32;
-      std::memcpy(&b32, &single, 4);
-      bits = b32;
-    } else {
-      std::memcpy(&bits, &dbl, 8);
-    }
-    return bits;
-  }
-  const uint32_t width = std::min<uint32_t>(signal.numBits, 40);
-  const uint64_t mask = (uint64_t{1} << width) - 1;
+  const uint64_t mask = (uint64_t{1} << std::min<uint32_t>(signal.numBits, 40)) - 1;
   return (0x9E3779B97F4A7C15ull * (index + 1)) >> 7 & mask;
 }
 
 // The value that `raw` stands for.
 inline double ValueOf(const tDbSignal &signal, uint64_t raw) {
-  if (signal.type == 2) {
-    if (signal.numBits == 32) {
-      float single;
-      const uint32_t b32 = static_cast<uint32_t>(raw);
-      std::memcpy(&single, &b32, 4);
-      return single * signal.scale + signal.offset;
-    }
-    double dbl;
-    std::memcpy(&dbl, &raw, 8);
-    return dbl * signal.scale + signal.offset;
-  }
   int64_t steps = static_cast<int64_t>(raw);
   if (signal.type == 0 && signal.numBits < 64 && (raw >> (signal.numBits - 1)) != 0) {
     steps -= int64_t{1} << signal.numBits;

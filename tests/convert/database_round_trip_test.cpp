@@ -17,9 +17,8 @@ struct tDatabase {
 };
 const tDatabase kDatabases[] = {{"tesla", TeslaDbc, false}, {"hyundai", HyundaiFdDbc, true}};
 
-// A decoded value lies within half a step of the scale; a float within its own precision.
+// A decoded value lies within half a step of the scale.
 double Tolerance(const tDbSignal &signal, double value) {
-  if (signal.type == 2) return std::fabs(value) * 1e-6;
   return std::fabs(signal.scale) / 2 + std::fabs(value) * 1e-12;
 }
 
