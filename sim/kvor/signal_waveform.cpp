@@ -1,5 +1,6 @@
 #include "signal_waveform.h"
 
+#include <algorithm>
 #include <cmath>
 #include <optional>
 #include <vector>

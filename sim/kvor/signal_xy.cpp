@@ -1,5 +1,6 @@
 #include "signal_xy.h"
 
+#include <algorithm>
 #include <cmath>
 #include <optional>
 #include <vector>
