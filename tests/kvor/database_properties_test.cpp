@@ -322,4 +322,22 @@ TEST_F(KvorDatabaseProperties, CallsAreLogged) {
   EXPECT_EQ(kvsimCountCalls("kvdbGetProperty"), 1);
 }
 
+TEST_F(KvorDatabaseProperties, CallsCanBeMadeToFailAndTheirStatusesHaveTexts) {
+  constexpr int32_t kFault = static_cast<int32_t>(0xBFF62777);
+  ASSERT_EQ(kvsimFailCall("kvdbFindObject", kFault, 1), 0);
+  ASSERT_EQ(kvsimFailProperty("kvdbGetProperty", kvPropFrm_ID, kFault, 1), 0);
+  uint32_t object = 0;
+  EXPECT_EQ(kvdbFindObject(cluster_, 0x20000, "DI_torque1", &object), kFault);
+  ASSERT_EQ(kvdbFindObject(cluster_, 0x20000, "DI_torque1", &object), 0) << "once only";
+  uint32_t id = 0;
+  EXPECT_EQ(kvdbGetProperty(object, kvPropFrm_ID, sizeof id, &id), kFault);
+  EXPECT_EQ(kvdbGetProperty(object, kvPropFrm_ID, sizeof id, &id), 0);
+  char unknown[256] = "", text[256] = "";
+  kvStatusToString(kFault, sizeof unknown, unknown);
+  for (int32_t status = kvsimErrDatabaseNotFound; status <= kvsimErrSignalLayout; ++status) {
+    kvStatusToString(status, sizeof text, text);
+    EXPECT_STRNE(text, unknown) << std::hex << status;
+  }
+}
+
 }  // namespace
