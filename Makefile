@@ -27,7 +27,7 @@ build: deps
 	cmake --build build -j $(JOBS)
 
 demo: build
-	./build/demo/kvsvdemo
+	./build/demo/kvsv-demo
 
 test-plain: build
 	ctest --test-dir build --output-on-failure -j $(JOBS)

@@ -1,0 +1,80 @@
+// One drive end to end: project sessions from a session file, values played on one interface of a
+// network on the virtual clock, and what the other interface reads of them as frames, single
+// points, pairs and waveforms, and what a conversion makes of the frames.
+#ifndef KVSVDEMO_DRIVE_SCENARIO_H
+#define KVSVDEMO_DRIVE_SCENARIO_H
+
+#include <cstdint>
+#include <string>
+#include <vector>
+
+#include "drive_signals.h"
+#include "library_exports.h"
+
+namespace kvsvdemo {
+
+struct tDriveOptions {
+  std::string dbcPath;
+  std::string interfaceName = "CAN1";  // the drive plays here; its partner on the network reads
+  std::string directory;              // the program's own directory: the session file goes here
+  int32_t steps = 300;                // of kStepSeconds each
+  size_t maxSignals = 6;
+};
+
+constexpr double kStepSeconds = 0.01;
+
+// One CAN frame as a host cluster holds it.
+struct tFrame {
+  uint64_t rawTime = 0;
+  uint32_t identifier = 0;
+  uint8_t type = 0;
+  uint8_t extended = 0;
+  std::vector<uint8_t> payload;
+  bool SameContent(const tFrame &o) const {
+    return identifier == o.identifier && type == o.type && extended == o.extended &&
+           payload == o.payload;
+  }
+};
+
+struct tWaveform {
+  uint64_t startRawTime = 0;
+  double interval = 0.0;
+  std::vector<double> samples;
+};
+
+struct tDriveResult {
+  // The first call that failed: its name and status; status 0 if none did.
+  std::string failedCall;
+  int32_t status = 0;
+  std::string statusText;
+
+  std::string readInterface;
+  std::vector<tDriveSignal> signals;
+  std::vector<uint64_t> writeTimes;                // raw clock of each write
+  std::vector<std::vector<double>> written;        // [step][signal]
+  std::vector<std::vector<double>> singlePoint;    // read after each write
+  std::vector<std::vector<double>> fromFrames;     // the frames of each step converted back
+  std::vector<std::vector<tFrame>> framesRead;     // per step
+  std::vector<std::vector<tFrame>> framesExpected; // per step, from the conversion session
+  std::vector<std::vector<uint64_t>> xyTimes;      // [signal][pair]
+  std::vector<std::vector<double>> xyValues;
+  std::vector<tWaveform> waveforms;                // one per signal
+
+  uint64_t steadyAllocations = 0;  // host allocations and resizes after the first step
+  int32_t steadyFrames = 0;
+  double steadySeconds = 0.0;
+  int32_t sessionsOpened = 0;
+  int32_t closesAtEnd = 0;         // references the host closed when the program ended
+  int32_t sessionsLeftOpen = 0;    // driver sessions open after that
+};
+
+// Runs the drive with the stand-ins reset first. Stops at the first call that fails.
+tDriveResult RunDrive(const tLibraryExports &library, const tDriveOptions &options);
+
+// The interface wired to `name` on its network ("CAN1" and "CAN2", "CAN3" and "CAN4"); empty for
+// one that has no partner.
+std::string PartnerInterface(const std::string &name);
+
+}  // namespace kvsvdemo
+
+#endif

@@ -1,0 +1,142 @@
+// kvsv-demo: a host program driving a vehicle network end to end through the library, which it
+// loads as a host does. The host stand-in linked into this program supplies the host's operations;
+// the driver stand-in, which the library loads by its own dependency, plays the hardware.
+#include <dlfcn.h>
+
+#include <cinttypes>
+#include <cmath>
+#include <cstdio>
+#include <cstring>
+#include <filesystem>
+#include <fstream>
+#include <string>
+
+#include "drive_scenario.h"
+#include "library_exports.h"
+#include "signals_svg.h"
+
+namespace {
+
+using namespace kvsvdemo;
+
+constexpr size_t kFrameRows = 8;
+
+void Usage() {
+  std::fprintf(stderr,
+               "usage: kvsv-demo [--dbc FILE] [--interface CAN1|CAN2|CAN3|CAN4] [--out DIR]\n");
+}
+
+std::string Hex(const std::vector<uint8_t> &bytes) {
+  std::string text;
+  char byte[4];
+  for (uint8_t b : bytes) {
+    std::snprintf(byte, sizeof byte, "%02X ", b);
+    text += byte;
+  }
+  return text;
+}
+
+void PrintFrames(const tDriveResult &r) {
+  std::printf("\nFrames read on %s (last step):\n  %-12s %-10s %-4s %s\n", r.readInterface.c_str(),
+              "time (s)", "id", "len", "payload");
+  const std::vector<tFrame> &frames = r.framesRead.back();
+  for (size_t i = 0; i < frames.size() && i < kFrameRows; ++i) {
+    const tFrame &f = frames[i];
+    const double seconds = static_cast<double>(f.rawTime - r.writeTimes.front()) / 1e7;
+    std::printf("  %-12.3f 0x%-8" PRIX32 "%s %-4zu %s\n", seconds, f.identifier,
+                f.extended ? "x" : " ", f.payload.size(), Hex(f.payload).c_str());
+  }
+}
+
+void PrintSignals(const tDriveResult &r) {
+  std::printf("\nSignals read on %s (last step):\n  %-48s %12s %12s %12s  %s\n",
+              r.readInterface.c_str(), "signal", "written", "single point", "from frames",
+              "unit");
+  for (size_t i = 0; i < r.signals.size(); ++i) {
+    const double converted = i < r.fromFrames.back().size() ? r.fromFrames.back()[i] : NAN;
+    const double single = i < r.singlePoint.back().size() ? r.singlePoint.back()[i] : NAN;
+    std::printf("  %-48s %12.4f %12.4f %12.4f  %s\n", r.signals[i].item.c_str(),
+                r.written.back()[i], single, converted, r.signals[i].unit.c_str());
+  }
+}
+
+void PrintCounts(const tDriveResult &r) {
+  size_t written = 0, read = 0, pairs = 0, samples = 0;
+  for (const auto &step : r.framesExpected) written += step.size();
+  for (const auto &step : r.framesRead) read += step.size();
+  for (const auto &signal : r.xyValues) pairs += signal.size();
+  for (const auto &w : r.waveforms) samples += w.samples.size();
+  std::printf("\nDrive: %zu steps of %.0f ms, %zu signals\n", r.written.size(),
+              kStepSeconds * 1000, r.signals.size());
+  std::printf("Frames: %zu written, %zu read\n", written, read);
+  std::printf("Pairs read: %zu, waveform samples read: %zu\n", pairs, samples);
+  std::printf("Steady loop: %" PRIu64 " host allocations, %.2f us per frame\n",
+              r.steadyAllocations,
+              r.steadyFrames > 0 ? r.steadySeconds * 1e6 / r.steadyFrames : 0.0);
+  std::printf("Program end: %d sessions opened, %d closed by the host, %d left open\n",
+              r.sessionsOpened, r.closesAtEnd, r.sessionsLeftOpen);
+}
+
+bool WritePicture(const tDriveResult &r, const std::string &directory) {
+  std::vector<tPlotCurve> curves;
+  for (size_t i = 0; i < r.waveforms.size() && i < 2; ++i) {
+    const tDriveSignal &s = r.signals[i];
+    curves.push_back({s.item + (s.unit.empty() ? "" : " (" + s.unit + ")"),
+                      r.waveforms[i].interval, r.waveforms[i].samples});
+  }
+  std::filesystem::create_directories(directory);
+  const std::string path = directory + "/signals.svg";
+  std::ofstream(path) << PlotSvg("Waveforms read on " + r.readInterface, curves);
+  std::printf("Picture: %s\n", path.c_str());
+  return std::filesystem::exists(path);
+}
+
+}  // namespace
+
+int main(int argc, char **argv) {
+  tDriveOptions options;
+  options.dbcPath = KVSV_DEMO_DBC;
+  std::string outDirectory = "demo-out";
+  for (int i = 1; i < argc; ++i) {
+    const std::string arg = argv[i];
+    if (i + 1 < argc && arg == "--dbc") {
+      options.dbcPath = std::filesystem::absolute(argv[++i]).string();
+    } else if (i + 1 < argc && arg == "--interface") {
+      options.interfaceName = argv[++i];
+    } else if (i + 1 < argc && arg == "--out") {
+      outDirectory = argv[++i];
+    } else {
+      Usage();
+      return 2;
+    }
+  }
+  options.directory = std::filesystem::absolute(outDirectory + "/app").string();
+  std::filesystem::create_directories(options.directory);
+
+  // The host loads the library with its symbols open to the process: the host finds the close of
+  // each reference there when the program ends. The path is the build's own copy, so that the
+  // loader's search (which a sanitizer's runtime changes) does not matter.
+  void *library = dlopen(KVSV_DEMO_LIBRARY, RTLD_NOW | RTLD_GLOBAL);
+  if (library == nullptr) {
+    std::fprintf(stderr, "cannot load %s: %s\n", KVSV_DEMO_LIBRARY, dlerror());
+    return 1;
+  }
+  std::string error;
+  const tLibraryExports exports = ExportsOf(library, error);
+  if (!error.empty()) {
+    std::fprintf(stderr, "%s: %s\n", KVSV_DEMO_LIBRARY, error.c_str());
+    return 1;
+  }
+
+  std::printf("Drive on %s with %s\n", options.interfaceName.c_str(), options.dbcPath.c_str());
+  const tDriveResult result = RunDrive(exports, options);
+  if (result.status < 0) {
+    std::fprintf(stderr, "%s failed: status 0x%08" PRIX32 " (%s)\n", result.failedCall.c_str(),
+                 static_cast<uint32_t>(result.status), result.statusText.c_str());
+    return 1;
+  }
+  PrintFrames(result);
+  PrintSignals(result);
+  PrintCounts(result);
+  return WritePicture(result, outDirectory) ? 0 : 1;
+}

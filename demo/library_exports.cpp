@@ -1,0 +1,32 @@
+#include "library_exports.h"
+
+#include <dlfcn.h>
+
+namespace kvsvdemo {
+
+namespace {
+
+template <typename T>
+void Find(void *library, const char *name, T &function, std::string &error) {
+  function = reinterpret_cast<T>(dlsym(library, name));
+  if (function == nullptr && error.empty()) error = std::string("no export ") + name;
+}
+
+}  // namespace
+
+tLibraryExports ExportsOf(void *library, std::string &error) {
+  tLibraryExports e;
+  Find(library, "kvsvStatusToString", e.statusToString, error);
+  Find(library, "kvsvSvTimeToRawTime", e.svTimeToRawTime, error);
+  Find(library, "kvsvSessionOpen", e.sessionOpen, error);
+  Find(library, "kvsvWriteSignalSinglePoint", e.writeSignalSinglePoint, error);
+  Find(library, "kvsvReadSignalSinglePoint", e.readSignalSinglePoint, error);
+  Find(library, "kvsvReadSignalXY", e.readSignalXY, error);
+  Find(library, "kvsvReadSignalWaveform", e.readSignalWaveform, error);
+  Find(library, "kvsvReadFrameCAN", e.readFrameCAN, error);
+  Find(library, "kvsvConvertSignalSinglePointToFrameCAN", e.convertSignalsToFrameCAN, error);
+  Find(library, "kvsvConvertFrameCANToSignalSinglePoint", e.convertFrameCANToSignals, error);
+  return e;
+}
+
+}  // namespace kvsvdemo

@@ -1,0 +1,34 @@
+// The library's exports that the drive calls, reached through a table so that a host program can
+// take them from a library it loaded itself, and a test from the library it was linked with.
+#ifndef KVSVDEMO_LIBRARY_EXPORTS_H
+#define KVSVDEMO_LIBRARY_EXPORTS_H
+
+#include <string>
+
+#include "kvsvapi.h"
+
+namespace kvsvdemo {
+
+struct tLibraryExports {
+  decltype(&kvsvStatusToString) statusToString = nullptr;
+  decltype(&kvsvSvTimeToRawTime) svTimeToRawTime = nullptr;
+  decltype(&kvsvSessionOpen) sessionOpen = nullptr;
+  decltype(&kvsvWriteSignalSinglePoint) writeSignalSinglePoint = nullptr;
+  decltype(&kvsvReadSignalSinglePoint) readSignalSinglePoint = nullptr;
+  decltype(&kvsvReadSignalXY) readSignalXY = nullptr;
+  decltype(&kvsvReadSignalWaveform) readSignalWaveform = nullptr;
+  decltype(&kvsvReadFrameCAN) readFrameCAN = nullptr;
+  decltype(&kvsvConvertSignalSinglePointToFrameCAN) convertSignalsToFrameCAN = nullptr;
+  decltype(&kvsvConvertFrameCANToSignalSinglePoint) convertFrameCANToSignals = nullptr;
+};
+
+// The exports of the library this program was linked with.
+tLibraryExports LinkedExports();
+
+// The exports of a library loaded at run time; on failure `error` names what is missing and the
+// result is incomplete.
+tLibraryExports ExportsOf(void *library, std::string &error);
+
+}  // namespace kvsvdemo
+
+#endif
