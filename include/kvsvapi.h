@@ -79,13 +79,18 @@ enum kvsvErrorCode {
 
 /* ---- Status text ------------------------------------------------------------------------- */
 
-/* Writes the driver's text for `status` into `text` (at most `size` bytes, NUL-terminated). */
+/* Writes the text of `status`, the library's own codes included, into the caller's buffer `text`
+ * of `size` bytes, cut to fit and NUL-terminated. The driver owns every text: the arguments go to
+ * it unchanged, and what it makes of a null `text` or a `size` of 0 is its own. No status. */
 KVSV_EXPORT void kvsvStatusToString(int32_t status, uint32_t size, char *text);
 
 /* ---- Time conversions ---------------------------------------------------------------------
  * rawTime: 100 ns since 1601-01-01 (values up to 118653335999999999 are relative times);
  * 1 ns time: ns since 1970-01-01. Zero means "no time" and converts to zero both ways.
- * A null result pointer is ignored; a null SvTime reads as zero. */
+ * The 100 ns forms are the raw forms under a second name. Towards a count, the fraction rounds
+ * to the nearest unit (an exact half rounds down); an SvTime with negative seconds gives raw
+ * time 0, and before 1970 gives a 1 ns count that has wrapped. No status: a null result pointer
+ * is ignored, a null SvTime reads as zero. */
 
 KVSV_EXPORT void kvsvRawTimeToSvTime(SvTime *result, uint64_t value);
 KVSV_EXPORT void kvsvSvTimeToRawTime(uint64_t *result, const SvTime *value);
@@ -99,23 +104,31 @@ KVSV_EXPORT void kvsvSvTimeTo1nsTime(uint64_t *result, const SvTime *value);
 /* Cookie of a reference registered with the host. */
 typedef uint64_t kvsvRefnum;
 
-/* Non-zero while a project session is open (manual sessions do not count). */
+/* 1 while a project session is open, else 0 (manual sessions do not count). Not a status. */
 KVSV_EXPORT int32_t kvsvGetIsProjectSessionOpen(void);
 
-/* Creates a session in the driver from its definition and registers it with the host as
- * "___kvorSesn#" plus its handle in eight hex digits; the reference goes to *reference. A session
- * the driver refuses is registered all the same (handle 0) and its status returned. */
+/* Creates a session in the driver from its definition (`database`, `cluster`, the comma list
+ * `list` of the session's objects, `interfaceName` and `mode`, all passed to the driver as they
+ * are) and registers it with the host as "___kvorSesn#" plus its handle in eight hex digits; the
+ * host's reference goes to *reference, which the program then holds and ends with
+ * kvsvSessionClear. A session the driver refuses is registered all the same (handle 0) and the
+ * driver's status returned, so that the reference stays usable and fails at its first use.
+ * 0xBFF63010: out of memory (the name, the registration texts or the session's slot).
+ * 0xBFF63001: the session table could not be set up, the project file's place could not be
+ * worked out, or the host refused the registration. A session the driver had made is cleared
+ * again when its name or registration fails. 0 on success (a driver warning is not passed on). */
 KVSV_EXPORT kvsvStatus kvsvSessionManualCreate(const char *database, const char *cluster,
                                                const char *list, const char *interfaceName,
                                                uint32_t mode, kvsvRefnum *reference);
 
-/* The host's open of a session reference: opens the project session named by the string handle
+/* The host's open of a session reference: opens the project session named by the host string
  * *name, as defined in the project session file kvorSession.txt (beside the application in a
  * built application, else in the directory "eTemporarySessionTextFileDir"). The first open on an
  * interface also creates the sessions of the file that share its interface, database and
  * cluster; their opens then take what was made. *session gets the session, or, when the open
  * fails, an error session that gives the failure at its first use. `context` is not used.
- * Always 0, with nothing done for a null `session`. */
+ * 0, with nothing done for a null `session`; 0xBFF63001 only if the session table could not be
+ * set up when the library was loaded. */
 KVSV_EXPORT kvsvStatus kvsvSessionOpen(SvHandle *name, uint32_t *session, uint64_t context);
 
 /* The open and close of the library's internal session reference: *session gets 0xDEADFAB4,
@@ -123,29 +136,42 @@ KVSV_EXPORT kvsvStatus kvsvSessionOpen(SvHandle *name, uint32_t *session, uint64
 KVSV_EXPORT kvsvStatus kvsvSessionInternalOpen(SvHandle *name, uint32_t *session);
 KVSV_EXPORT kvsvStatus kvsvSessionInternalClose(void);
 
-/* Copies the host handle *source into *target (made or resized to fit); the host's status.
- * 0xBFF63015: `source` is null. */
+/* Copies the host handle *source into *target (made or resized to fit, owned by the caller);
+ * the reserved arguments are not read. 0xBFF63015: `source` is null. Otherwise the host's status
+ * of the copy. */
 KVSV_EXPORT kvsvStatus kvsvInternalHandleToRef(void *reserved1, SvHandle *source,
                                                void *reserved2, SvHandle *target);
 
 /* The host's close of a session reference (any reference is accepted and sent to the close of its
- * class). Clears the session in the driver, waits for calls that use it, frees its slot. 0. */
+ * class). Clears the session in the driver, waits for calls that use it, frees its slot; the
+ * error handle of a failed device or interface open is cleared and forgotten. 0; 0xBFF63001 only
+ * if the session table could not be set up when the library was loaded. */
 KVSV_EXPORT kvsvStatus kvsvSessionClose(uint32_t session);
 
-/* Removes the host reference, then closes the session as kvsvSessionClose does. Returns the
- * outcome of the removal (a host warning is dropped). */
+/* Removes the host reference `reference` (none for 0), then closes the session as
+ * kvsvSessionClose does (none for 0). 0, or 0xBFF63001 when the host refused the removal (the
+ * session is closed all the same) or the session table could not be set up; a host warning is
+ * dropped. */
 KVSV_EXPORT kvsvStatus kvsvSessionClear(uint32_t session, kvsvRefnum reference);
 
-/* The clean-up that blocking calls register with the host: closes the session without any lock,
- * even while a call is blocked on it, and frees the call's guard. Always 0. */
+/* The clean-up that blocking calls register with the host, with the session handle in the low 32
+ * bits of `session`: closes the session without any lock, even while a call is blocked on it,
+ * and frees the call's guard. Every failure is dropped: always 0. */
 KVSV_EXPORT kvsvStatus kvsvSessionAbort(uint64_t session);
 
-/* Waits in the driver for `condition`; a time limit other than 0.0 first registers
- * kvsvSessionAbort as the program's clean-up. The driver's status. */
+/* Waits in the driver for `condition` with `parameter`, the driver writing its answer to
+ * *parameterOut; all five arguments go to the driver as they are. A time limit other than 0.0
+ * (NaN included) first registers kvsvSessionAbort as the program's clean-up, and it stays
+ * registered. The driver's status. */
 KVSV_EXPORT kvsvStatus kvsvSessionWait(uint32_t session, uint32_t condition, uint32_t parameter,
                                        uint32_t *parameterOut, double timeLimit);
 
-/* Forwards to the driver, arguments unchanged, returning its status. */
+/* Session and interface control: each forwards to the driver, arguments unchanged, and returns
+ * its status. They take no lock and no guard of the session, so they run beside a read or write
+ * on it; an unknown session is the driver's to report. Start and stop act on `scope`; the
+ * terminal calls connect or disconnect the terminals named `source` and `destination`; the
+ * FlexRay macrotick call gives the driver's timing source in *timingSource; blink sets the
+ * identification light of the interface reference `interfaceRef` to `mode`. */
 KVSV_EXPORT kvsvStatus kvsvSessionStart(uint32_t session, uint32_t scope);
 KVSV_EXPORT kvsvStatus kvsvSessionStop(uint32_t session, uint32_t scope);
 KVSV_EXPORT kvsvStatus kvsvSessionFlush(uint32_t session);
@@ -159,29 +185,42 @@ KVSV_EXPORT kvsvStatus kvsvInterfaceBlink(uint32_t interfaceRef, uint32_t mode);
 
 /* ---- System, devices, interfaces ----------------------------------------------------------- */
 
-/* Opens the driver's system (counted); *system gets its handle, or an error handle standing for
- * a failed open. `name` is not read. Always 0. */
+/* Each system, device and interface reference that is open holds one count on the driver's
+ * system; the last release closes it. These exports report 0xBFF63001 when the library's system
+ * table could not be set up at load.
+ *
+ * Opens the driver's system (counted); *system gets its handle, or an error handle standing for
+ * a failed open (the count then stays 0, so that the next open asks the driver again). `name` is
+ * not read. 0; 0xBFF63001: `system` is null. */
 KVSV_EXPORT kvsvStatus kvsvSystemOpen(SvHandle *name, uint32_t *system);
 
-/* Releases a system reference; the last one closes the driver's system. Other classes go to the
- * close of their class. 0. */
+/* Releases a system reference; the last one closes the driver's system. A reference of another
+ * class goes to the close of its class. 0. */
 KVSV_EXPORT kvsvStatus kvsvSystemClose(uint32_t system);
 
-/* Closes the system whatever its count, removing every device and interface reference. Both
- * outputs are set to 0. The driver's status. */
+/* Closes the system whatever its count, removing every device and interface reference from the
+ * host. Both outputs, where not null, are set to 0. 0 when no system is open, else the driver's
+ * status of the close. */
 KVSV_EXPORT kvsvStatus kvsvSystemManualClose(uint64_t *reserved1, uint64_t *reserved2);
 
-/* Number of system references out. */
+/* Number of counts held on the driver's system (see above). Not a status. */
 KVSV_EXPORT uint32_t kvsvGetSystemRefCount(void);
 
-/* Opens the device named by the string handle *name ("___kvorDev#" plus the complement of its
- * serial number in eight hex digits). An unknown name gives status 0 and an error handle whose
- * first use fails. 0xBFF630A5: empty name; 0xBFF63001: null output. */
+/* Opens the device named by the host string *name ("___kvorDev#" plus the complement of its
+ * serial number in eight hex digits; case does not matter) into *device, taking a count on the
+ * system. A name not found, or a driver failure in the search, gives status 0 and an error handle
+ * whose first use fails. A second open of the same name drops the host reference of the first.
+ * 0xBFF630A5: null or empty name (nothing is opened). 0xBFF63001: `device` is null. When the
+ * bookkeeping runs out of memory the count is given back and the status is 0xBFF63010, or the
+ * search's failure if it had failed. Otherwise 0 or the driver's warning of the search.
+ * The close releases the device and its count, as kvsvSystemClose does for the system; a
+ * reference of another class goes to the close of its class. 0. */
 KVSV_EXPORT kvsvStatus kvsvDeviceOpen(SvHandle *name, uint32_t *device);
 KVSV_EXPORT kvsvStatus kvsvDeviceClose(uint32_t device);
 
 /* Opens the interface named by *name (case does not matter; an Ethernet interface also answers to
- * its name plus "/monitor"). Unknown names as for devices; 0xBFF6308A: empty name. */
+ * its name plus "/monitor") into *interfaceRef; otherwise as for devices, but 0xBFF6308A for a
+ * null or empty name. The close as for devices. */
 KVSV_EXPORT kvsvStatus kvsvInterfaceOpen(SvHandle *name, uint32_t *interfaceRef);
 KVSV_EXPORT kvsvStatus kvsvInterfaceClose(uint32_t interfaceRef);
 
@@ -205,7 +244,9 @@ KVSV_EXPORT kvsvStatus kvsvPathGetMultibyteString(const char *name, uint64_t nam
                                                   uint64_t bufferSize, char *buffer);
 
 /* Stores the directory named by the host string `name` in the host string `text` (a null handle
- * or block reads as an empty name). */
+ * or block reads as an empty name). `text` is the caller's existing handle, which the host resizes
+ * to the counted text (no NUL); it should not be null, as a handle that the host had to make
+ * anew would not reach the caller. */
 KVSV_EXPORT kvsvStatus kvsvGetPathMultibyteStringAsSvStr(SvHandle name, SvHandle text);
 
 /* ---- Frame writes -------------------------------------------------------------------------- */
@@ -227,7 +268,9 @@ KVSV_EXPORT kvsvStatus kvsvWriteFrameFlexRay(uint32_t session, SvHandle frames, 
 KVSV_EXPORT kvsvStatus kvsvWriteFrameEthernet(uint32_t session, SvHandle frames, double timeout);
 
 /* Hands the bytes of the host byte array `data` (count at byte 0, bytes from byte 4), records
- * that the program built itself, to the driver as they are. The driver's status. */
+ * that the program built itself, to the driver as they are; a null handle or block sends none.
+ * No slot or guard is taken, so the driver alone judges the session. `timeout` as for
+ * kvsvWriteFrameCAN. The driver's status. */
 KVSV_EXPORT kvsvStatus kvsvWriteFrameRaw(uint32_t session, SvHandle data, double timeout);
 
 /* ---- Frame reads ---------------------------------------------------------------------------
@@ -282,9 +325,12 @@ KVSV_EXPORT kvsvStatus kvsvReadFrameEthernetEx(uint32_t session, int32_t numFram
                                                const uint8_t *skip, double timeout);
 
 /* At most `numBytes` bytes of the driver's packed frame records, as they are, into the host byte
- * array `*data` (count at byte 0, bytes from byte 4), created or grown as needed. A negative
- * `numBytes` asks for the session's whole capacity and needs a `timeout` of 0.0 (else
- * 0xBFF630A0). The count is the bytes the driver gave. 0xBFF63015: `data` is null. */
+ * array `*data` (count at byte 0, bytes from byte 4), created or grown as needed, never shrunk.
+ * A negative `numBytes` asks for the session's whole capacity (its list's records at the payload
+ * limit in a single-point session, else its queue size) and needs a `timeout` of 0.0 (else
+ * 0xBFF630A0). `timeout` as for the other reads. The count is the bytes the driver gave, 0 if it
+ * was not called. 0xBFF63015: `data` is null. 0xBFF63020, 0xBFF63027 as for the other reads.
+ * 0xBFF630B0: the host could not grow the array. Otherwise the driver's status. */
 KVSV_EXPORT kvsvStatus kvsvReadFrameRaw(uint32_t session, int32_t numBytes, SvHandle *data,
                                         double timeout);
 
@@ -401,7 +447,10 @@ KVSV_EXPORT kvsvStatus kvsvConvertFrameFlexRayToByteArraySinglePoint(uint32_t se
  * After a failure past the session checks the array's count is 0. */
 KVSV_EXPORT kvsvStatus kvsvReadSignalSinglePoint(uint32_t session, SvHandle *values);
 
-/* Writes one value per signal of `session` from the host double array `values`. */
+/* Writes the values of the host double array `values` (count at byte 0, values from byte 8),
+ * one per signal of `session`, to the driver as they are; a null handle or block sends none. No
+ * slot or guard is taken, so the driver alone judges the session and the number of values. The
+ * driver's status. */
 KVSV_EXPORT kvsvStatus kvsvWriteSignalSinglePoint(uint32_t session, SvHandle values);
 
 /* A waveform of the host's waveform array, as Lock describes it (80 bytes). */
@@ -454,8 +503,13 @@ KVSV_EXPORT kvsvStatus kvsvReadSignalWaveform(uint32_t session, int32_t numSampl
                                               SvWaveformArray *waveforms, double timeout);
 
 /* Writes the samples of `waveforms`, one waveform per signal of `session`, every waveform cut to
- * the shortest. 0xBFF63160: the array does not hold one waveform per signal. 0xBFF63010: out of
- * memory, or the host refused to lock the array. 0xBFF63015: `waveforms` is null. */
+ * the shortest; the driver reads them from the waveforms' own storage. `timeout` goes to the
+ * driver, any value but 0.0 (NaN included) first registering kvsvSessionAbort as the program's
+ * clean-up. 0xBFF63020: no such session. 0xBFF63027: the session is in use by another call or
+ * closing. 0xBFF63160: the array does not hold one waveform per signal. 0xBFF63010: out of
+ * memory, or the host refused to lock the array. 0xBFF63015: `waveforms` is null. 0xBFF63001:
+ * the host refused to unlock the array after the write. Otherwise the driver's status, that of
+ * the signal count read included. */
 KVSV_EXPORT kvsvStatus kvsvWriteSignalWaveform(uint32_t session, SvWaveformArray *waveforms,
                                                double timeout);
 
@@ -480,7 +534,11 @@ KVSV_EXPORT kvsvStatus kvsvReadSignalXYEx(uint32_t session, int32_t numSamples,
 /* Writes the pairs of `clusters`, laid out as kvsvReadSignalXY fills them, one cluster per signal
  * of `session`. If any timestamp array is not empty, each signal sends as many pairs as it has
  * both values and timestamps for; otherwise it sends its values and the driver stamps them.
- * 0xBFF63160: null handle or block, or not one cluster per signal. 0xBFF63010: out of memory. */
+ * `timeout` goes to the driver, any value but 0.0 (NaN included) first registering
+ * kvsvSessionAbort as the program's clean-up. 0xBFF63020: no such session. 0xBFF63027: the
+ * session is in use by another call or closing. 0xBFF63160: null handle or block, or not one
+ * cluster per signal. 0xBFF63010: out of memory. Otherwise the driver's status, that of the
+ * signal count read included. */
 KVSV_EXPORT kvsvStatus kvsvWriteSignalXY(uint32_t session, SvHandle clusters, double timeout);
 
 #ifdef __cplusplus
