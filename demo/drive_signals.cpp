@@ -130,22 +130,24 @@ std::vector<tDriveSignal> PickDriveSignals(const std::string &path, size_t count
       if (!SetRawRange(signal, numBits, type == 0, Read<double>(handle, kvPropSig_Min),
                        Read<double>(handle, kvPropSig_Max)))
         continue;
-      if (Usable(path, signal.item)) found.push_back(signal);
+      found.push_back(signal);
     }
   }
   kvdbCloseDatabase(database, 0);
 
-  // One of each role by name, then the others in file order.
+  // One of each role by name, then the others in file order. Only what would be taken is tried
+  // as a session: a database may hold thousands of signals.
+  const auto usable = [&path](const tDriveSignal &s) { return Usable(path, s.item); };
   std::vector<tDriveSignal> picked;
   for (eRole role : {eRole::kSpeed, eRole::kSteering, eRole::kGear}) {
     // The vehicle's own speed rather than a set point, where the names tell them apart.
-    auto it = std::find_if(found.begin(), found.end(), [role](const tDriveSignal &s) {
+    auto it = std::find_if(found.begin(), found.end(), [&](const tDriveSignal &s) {
       return s.role == role && role == eRole::kSpeed &&
-             Lower(s.item).find("vehiclespeed") != std::string::npos;
+             Lower(s.item).find("vehiclespeed") != std::string::npos && usable(s);
     });
     if (it == found.end())
       it = std::find_if(found.begin(), found.end(),
-                        [role](const tDriveSignal &s) { return s.role == role; });
+                        [&](const tDriveSignal &s) { return s.role == role && usable(s); });
     if (it != found.end() && picked.size() < count) {
       picked.push_back(*it);
       found.erase(it);
@@ -153,6 +155,7 @@ std::vector<tDriveSignal> PickDriveSignals(const std::string &path, size_t count
   }
   for (tDriveSignal &signal : found) {
     if (picked.size() >= count) break;
+    if (!usable(signal)) continue;
     // A second speed or gear signal takes a course of its own.
     signal.role = eRole::kOther;
     picked.push_back(signal);

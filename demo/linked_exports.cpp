@@ -1,0 +1,21 @@
+// Kept apart from the run-time lookup: only a program linked with the library may use it.
+#include "library_exports.h"
+
+namespace kvsvdemo {
+
+tLibraryExports LinkedExports() {
+  tLibraryExports e;
+  e.statusToString = &kvsvStatusToString;
+  e.svTimeToRawTime = &kvsvSvTimeToRawTime;
+  e.sessionOpen = &kvsvSessionOpen;
+  e.writeSignalSinglePoint = &kvsvWriteSignalSinglePoint;
+  e.readSignalSinglePoint = &kvsvReadSignalSinglePoint;
+  e.readSignalXY = &kvsvReadSignalXY;
+  e.readSignalWaveform = &kvsvReadSignalWaveform;
+  e.readFrameCAN = &kvsvReadFrameCAN;
+  e.convertSignalsToFrameCAN = &kvsvConvertSignalSinglePointToFrameCAN;
+  e.convertFrameCANToSignals = &kvsvConvertFrameCANToSignalSinglePoint;
+  return e;
+}
+
+}  // namespace kvsvdemo

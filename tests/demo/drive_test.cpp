@@ -1,0 +1,176 @@
+// The drive of kvsv-demo on every database file of the field: every frame written arrives as the
+// conversion session makes it, every value read back, single point, from the frames, as pairs and
+// as waveform samples, is the one written within its resolution, the steady loop allocates
+// nothing, and the end of the program closes every session.
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <cmath>
+#include <filesystem>
+#include <string>
+#include <vector>
+
+#include "drive_scenario.h"
+#include "paths/paths_test_support.h"
+
+namespace {
+
+using namespace kvsvdemo;
+
+constexpr int32_t kSteps = 120;
+
+std::vector<std::string> FieldFiles() {
+  std::vector<std::string> files;
+  for (const auto &entry : std::filesystem::directory_iterator(KVSV_DBC_DIR)) {
+    if (entry.path().extension() == ".dbc") files.push_back(entry.path().filename().string());
+  }
+  std::sort(files.begin(), files.end());
+  return files;
+}
+
+tDriveResult Drive(const std::string &dbc, const std::string &interfaceName,
+                   const kvsvtest::cTempDir &directory) {
+  tDriveOptions options;
+  options.dbcPath = std::string(KVSV_DBC_DIR) + "/" + dbc;
+  options.interfaceName = interfaceName;
+  options.directory = directory.Path();
+  options.steps = kSteps;
+  return RunDrive(LinkedExports(), options);
+}
+
+// The value written last at or before `rawTime`; 0.0 before the first write.
+double WrittenAt(const tDriveResult &r, size_t signal, uint64_t rawTime) {
+  double value = 0.0;
+  for (size_t k = 0; k < r.writeTimes.size() && r.writeTimes[k] <= rawTime; ++k)
+    value = r.written[k][signal];
+  return value;
+}
+
+class DriveOnFieldFile : public testing::TestWithParam<std::string> {};
+
+TEST_P(DriveOnFieldFile, EverythingWrittenIsReadBack) {
+  kvsvtest::cTempDir directory;
+  const tDriveResult r = Drive(GetParam(), "CAN1", directory);
+  ASSERT_EQ(r.status, 0) << r.failedCall << ": " << r.statusText;
+  ASSERT_FALSE(r.signals.empty());
+  ASSERT_EQ(r.written.size(), static_cast<size_t>(kSteps));
+  const size_t n = r.signals.size();
+
+  // The drive moves: a check against values that never change would prove little.
+  size_t moving = 0;
+  for (size_t i = 0; i < n; ++i) moving += r.written.front()[i] != r.written[kSteps / 2][i];
+  EXPECT_GT(moving, 0u);
+
+  for (size_t k = 0; k < r.written.size(); ++k) {
+    SCOPED_TRACE("step " + std::to_string(k));
+    ASSERT_FALSE(r.framesExpected[k].empty());
+    ASSERT_EQ(r.framesRead[k].size(), r.framesExpected[k].size());
+    for (size_t f = 0; f < r.framesRead[k].size(); ++f) {
+      EXPECT_TRUE(r.framesRead[k][f].SameContent(r.framesExpected[k][f])) << "frame " << f;
+      EXPECT_EQ(r.framesRead[k][f].rawTime, r.writeTimes[k]);
+    }
+    ASSERT_EQ(r.singlePoint[k].size(), n);
+    ASSERT_EQ(r.fromFrames[k].size(), n);
+    for (size_t i = 0; i < n; ++i) {
+      EXPECT_NEAR(r.singlePoint[k][i], r.written[k][i], r.signals[i].Tolerance())
+          << r.signals[i].item;
+      EXPECT_NEAR(r.fromFrames[k][i], r.written[k][i], r.signals[i].Tolerance())
+          << r.signals[i].item;
+    }
+  }
+
+  ASSERT_EQ(r.xyValues.size(), n);
+  for (size_t i = 0; i < n; ++i) {
+    SCOPED_TRACE(r.signals[i].item);
+    ASSERT_EQ(r.xyValues[i].size(), static_cast<size_t>(kSteps));
+    EXPECT_EQ(r.xyTimes[i], r.writeTimes);
+    for (size_t k = 0; k < r.xyValues[i].size(); ++k)
+      EXPECT_NEAR(r.xyValues[i][k], r.written[k][i], r.signals[i].Tolerance()) << "pair " << k;
+  }
+
+  ASSERT_EQ(r.waveforms.size(), n);
+  for (size_t i = 0; i < n; ++i) {
+    SCOPED_TRACE(r.signals[i].item);
+    const tWaveform &w = r.waveforms[i];
+    EXPECT_DOUBLE_EQ(w.interval, kStepSeconds);
+    ASSERT_EQ(w.samples.size(), static_cast<size_t>(kSteps + 1));
+    for (size_t j = 0; j < w.samples.size(); ++j) {
+      const uint64_t at = w.startRawTime + static_cast<uint64_t>(std::llround(j * w.interval * 1e7));
+      EXPECT_NEAR(w.samples[j], WrittenAt(r, i, at), r.signals[i].Tolerance()) << "sample " << j;
+    }
+  }
+
+  EXPECT_EQ(r.steadyAllocations, 0u);
+  EXPECT_GT(r.steadyFrames, 0);
+  EXPECT_EQ(r.sessionsOpened, 6);
+  EXPECT_EQ(r.closesAtEnd, r.sessionsOpened);
+  EXPECT_EQ(r.sessionsLeftOpen, 0);
+}
+
+INSTANTIATE_TEST_SUITE_P(FieldFiles, DriveOnFieldFile, testing::ValuesIn(FieldFiles()),
+                         [](const testing::TestParamInfo<std::string> &info) {
+                           std::string name = info.param.substr(0, info.param.find('.'));
+                           for (char &c : name) c = std::isalnum(static_cast<unsigned char>(c)) ? c : '_';
+                           return name;
+                         });
+
+TEST(Drive, TheOtherNetworkCarriesItToo) {
+  kvsvtest::cTempDir directory;
+  const tDriveResult r = Drive("tesla_can.dbc", "CAN4", directory);
+  ASSERT_EQ(r.status, 0) << r.failedCall << ": " << r.statusText;
+  EXPECT_EQ(r.readInterface, "CAN3");
+  ASSERT_FALSE(r.singlePoint.empty());
+  for (size_t i = 0; i < r.signals.size(); ++i)
+    EXPECT_NEAR(r.singlePoint.back()[i], r.written.back()[i], r.signals[i].Tolerance());
+}
+
+TEST(Drive, PicksSpeedSteeringAndGearByName) {
+  kvsvtest::cTempDir directory;
+  const tDriveResult r = Drive("tesla_can.dbc", "CAN1", directory);
+  ASSERT_GE(r.signals.size(), 3u);
+  EXPECT_EQ(r.signals[0].role, eRole::kSpeed);
+  EXPECT_EQ(r.signals[0].item, "DI_torque2.DI_vehicleSpeed");
+  EXPECT_EQ(r.signals[0].unit, "MPH");
+  EXPECT_EQ(r.signals[1].role, eRole::kSteering);
+  EXPECT_EQ(r.signals[2].role, eRole::kGear);
+}
+
+TEST(Drive, AFailureNamesTheCallAndItsStatus) {
+  kvsvtest::cTempDir directory;
+  const struct {
+    const char *dbc;
+    const char *interfaceName;
+  } cases[] = {{"no_such_file.dbc", "CAN1"}, {"tesla_can.dbc", "LIN1"}};
+  for (const auto &c : cases) {
+    SCOPED_TRACE(c.dbc + std::string(" on ") + c.interfaceName);
+    const tDriveResult r = Drive(c.dbc, c.interfaceName, directory);
+    EXPECT_LT(r.status, 0);
+    EXPECT_FALSE(r.failedCall.empty());
+    EXPECT_FALSE(r.statusText.empty());
+    EXPECT_TRUE(r.written.empty());
+  }
+}
+
+TEST(Drive, PartnerInterfaces) {
+  const std::pair<const char *, const char *> cases[] = {
+      {"CAN1", "CAN2"}, {"CAN2", "CAN1"}, {"CAN3", "CAN4"}, {"CAN4", "CAN3"},
+      {"CAN5", ""},     {"LIN1", ""},     {"CAN", ""},      {"CAN10", ""}};
+  for (const auto &[name, partner] : cases) EXPECT_EQ(PartnerInterface(name), partner) << name;
+}
+
+TEST(DriveSignal, ValuesLieOnWholeRawStepsWithinTheRange) {
+  tDriveSignal s;
+  s.scale = 0.05;
+  s.offset = -25.0;
+  s.rawLow = 0;
+  s.rawHigh = 4095;
+  EXPECT_DOUBLE_EQ(s.ValueAt(0.0), -25.0);
+  EXPECT_DOUBLE_EQ(s.ValueAt(1.0), 4095 * 0.05 - 25.0);
+  EXPECT_DOUBLE_EQ(s.ValueAt(2.0), s.ValueAt(1.0));
+  EXPECT_DOUBLE_EQ(s.ValueAt(-1.0), s.ValueAt(0.0));
+  const double mid = s.ValueAt(0.5);
+  EXPECT_NEAR(std::remainder((mid - s.offset) / s.scale, 1.0), 0.0, 1e-9);
+  EXPECT_DOUBLE_EQ(s.Tolerance(), 0.025);
+}
+
+}  // namespace
