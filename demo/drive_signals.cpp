@@ -95,6 +95,12 @@ double tDriveSignal::ValueAt(double fraction) const {
   return static_cast<double>(raw) * scale + offset;
 }
 
+double tDriveSignal::FractionOf(double value) const {
+  const double low = static_cast<double>(rawLow) * scale + offset;
+  const double high = static_cast<double>(rawHigh) * scale + offset;
+  return std::clamp((value - low) / (high - low), 0.0, 1.0);
+}
+
 double tDriveSignal::Tolerance() const { return std::fabs(scale) / 2; }
 
 std::vector<tDriveSignal> PickDriveSignals(const std::string &path, size_t count,
@@ -167,8 +173,10 @@ std::vector<tDriveSignal> PickDriveSignals(const std::string &path, size_t count
 double DriveValue(const tDriveSignal &signal, size_t index, double seconds, double duration) {
   const double phase = seconds / duration;
   switch (signal.role) {
-    case eRole::kSpeed:  // away from standstill, up to speed and back down
-      return signal.ValueAt(0.5 - 0.5 * std::cos(2 * kPi * phase));
+    case eRole::kSpeed: {  // away from standstill, up to speed and back down
+      const double stand = signal.FractionOf(0.0);
+      return signal.ValueAt(stand + (1 - stand) * (0.5 - 0.5 * std::cos(2 * kPi * phase)));
+    }
     case eRole::kSteering:  // weaving about straight ahead
       return signal.ValueAt(0.5 + 0.3 * std::sin(2 * kPi * 1.5 * phase));
     case eRole::kGear:  // a step up every quarter of the drive

@@ -22,6 +22,8 @@ struct tDriveSignal {
 
   // The value at `fraction` (0..1) of the signal's range, on a whole raw step.
   double ValueAt(double fraction) const;
+  // Where `value` lies in the signal's range, 0..1 (clamped).
+  double FractionOf(double value) const;
   // Half a raw step: how far a value read back may lie from the one written.
   double Tolerance() const;
 };

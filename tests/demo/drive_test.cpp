@@ -131,6 +131,12 @@ TEST(Drive, PicksSpeedSteeringAndGearByName) {
   EXPECT_EQ(r.signals[0].role, eRole::kSpeed);
   EXPECT_EQ(r.signals[0].item, "DI_torque2.DI_vehicleSpeed");
   EXPECT_EQ(r.signals[0].unit, "MPH");
+  // The drive starts from standstill and comes back to it.
+  EXPECT_GE(r.written.front()[0], 0.0);
+  EXPECT_LT(r.written.front()[0], 1.0);
+  double top = 0.0;
+  for (const std::vector<double> &step : r.written) top = std::max(top, step[0]);
+  EXPECT_GT(top, 100.0);
   EXPECT_EQ(r.signals[1].role, eRole::kSteering);
   EXPECT_EQ(r.signals[2].role, eRole::kGear);
 }
@@ -171,6 +177,9 @@ TEST(DriveSignal, ValuesLieOnWholeRawStepsWithinTheRange) {
   const double mid = s.ValueAt(0.5);
   EXPECT_NEAR(std::remainder((mid - s.offset) / s.scale, 1.0), 0.0, 1e-9);
   EXPECT_DOUBLE_EQ(s.Tolerance(), 0.025);
+  EXPECT_DOUBLE_EQ(s.ValueAt(s.FractionOf(0.0)), 0.0);
+  EXPECT_DOUBLE_EQ(s.FractionOf(-100.0), 0.0);
+  EXPECT_DOUBLE_EQ(s.FractionOf(1000.0), 1.0);
 }
 
 }  // namespace
