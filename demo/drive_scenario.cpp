@@ -105,9 +105,10 @@ class cDrive {
       return Fail("no partner on the network of " + options_.interfaceName, kvErrInternal);
     kvsimReset();
     svsimReset();
-    std::string error;
-    r_.signals = PickDriveSignals(options_.dbcPath, options_.maxSignals, error);
-    if (r_.signals.empty()) return Fail(error, kvErrDbObjectNotFound);
+    std::string what;
+    int32_t status = 0;
+    r_.signals = PickDriveSignals(options_.dbcPath, options_.maxSignals, what, status);
+    if (r_.signals.empty()) return Fail(what, status);
     // A built application keeps its session file beside itself.
     svsimSetRunMode(1, 1, 1);
     svsimSetAppPath(options_.directory.c_str());
@@ -182,7 +183,8 @@ class cDrive {
       for (size_t i = 0; i < n; ++i)
         out[i] = DriveValue(r_.signals[i], i, (step + 1) * kStepSeconds, duration);
       r_.written.emplace_back(out, out + n);
-      if (!Check("kvsvWriteSignalSinglePoint", lib_.writeSignalSinglePoint(handles_[kDriveOut], values)) ||
+      if (!Check("kvsvWriteSignalSinglePoint",
+                 lib_.writeSignalSinglePoint(handles_[kDriveOut], values)) ||
           !Check("kvsvReadFrameCAN",
                  lib_.readFrameCAN(handles_[kFramesIn], -1, &frames, &spares, 0.0)) ||
           !Check("kvsvReadSignalSinglePoint",

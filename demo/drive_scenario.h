@@ -16,8 +16,8 @@ namespace kvsvdemo {
 struct tDriveOptions {
   std::string dbcPath;
   std::string interfaceName = "CAN1";  // the drive plays here; its partner on the network reads
-  std::string directory;              // the program's own directory: the session file goes here
-  int32_t steps = 300;                // of kStepSeconds each
+  std::string directory;               // the program's own directory: the session file goes here
+  int32_t steps = 300;                 // of kStepSeconds each
   size_t maxSignals = 6;
 };
 
@@ -50,22 +50,22 @@ struct tDriveResult {
 
   std::string readInterface;
   std::vector<tDriveSignal> signals;
-  std::vector<uint64_t> writeTimes;                // raw clock of each write
-  std::vector<std::vector<double>> written;        // [step][signal]
-  std::vector<std::vector<double>> singlePoint;    // read after each write
-  std::vector<std::vector<double>> fromFrames;     // the frames of each step converted back
-  std::vector<std::vector<tFrame>> framesRead;     // per step
-  std::vector<std::vector<tFrame>> framesExpected; // per step, from the conversion session
-  std::vector<std::vector<uint64_t>> xyTimes;      // [signal][pair]
+  std::vector<uint64_t> writeTimes;                 // raw clock of each write
+  std::vector<std::vector<double>> written;         // [step][signal]
+  std::vector<std::vector<double>> singlePoint;     // read after each write
+  std::vector<std::vector<double>> fromFrames;      // the frames of each step converted back
+  std::vector<std::vector<tFrame>> framesRead;      // per step
+  std::vector<std::vector<tFrame>> framesExpected;  // per step, from the conversion session
+  std::vector<std::vector<uint64_t>> xyTimes;       // [signal][pair]
   std::vector<std::vector<double>> xyValues;
-  std::vector<tWaveform> waveforms;                // one per signal
+  std::vector<tWaveform> waveforms;  // one per signal
 
   uint64_t steadyAllocations = 0;  // host allocations and resizes after the first step
   int32_t steadyFrames = 0;
   double steadySeconds = 0.0;
   int32_t sessionsOpened = 0;
-  int32_t closesAtEnd = 0;         // references the host closed when the program ended
-  int32_t sessionsLeftOpen = 0;    // driver sessions open after that
+  int32_t closesAtEnd = 0;       // references the host closed when the program ended
+  int32_t sessionsLeftOpen = 0;  // driver sessions open after that
 };
 
 // Runs the drive with the stand-ins reset first. Stops at the first call that fails.

@@ -91,7 +91,8 @@ bool SetRawRange(tDriveSignal &signal, uint32_t numBits, bool isSigned, double l
 
 double tDriveSignal::ValueAt(double fraction) const {
   const double span = static_cast<double>(rawHigh - rawLow);
-  const int64_t raw = rawLow + static_cast<int64_t>(std::llround(std::clamp(fraction, 0.0, 1.0) * span));
+  const int64_t raw =
+      rawLow + static_cast<int64_t>(std::llround(std::clamp(fraction, 0.0, 1.0) * span));
   return static_cast<double>(raw) * scale + offset;
 }
 
@@ -103,20 +104,18 @@ double tDriveSignal::FractionOf(double value) const {
 
 double tDriveSignal::Tolerance() const { return std::fabs(scale) / 2; }
 
-std::vector<tDriveSignal> PickDriveSignals(const std::string &path, size_t count,
-                                           std::string &error) {
+std::vector<tDriveSignal> PickDriveSignals(const std::string &path, size_t count, std::string &what,
+                                           int32_t &status) {
   uint32_t database = 0;
-  const int32_t status = kvdbOpenDatabase(path.c_str(), &database);
+  status = kvdbOpenDatabase(path.c_str(), &database);
   if (status != 0) {
-    char text[256] = {0};
-    kvStatusToString(status, sizeof text, text);
-    error = "cannot open " + path + ": " + text;
+    what = "kvdbOpenDatabase " + path;
     return {};
   }
   std::vector<tDriveSignal> found;
   const std::vector<uint32_t> clusters = Handles(database, kvPropDatabase_ClstRefs);
-  for (uint32_t frame : clusters.empty() ? std::vector<uint32_t>{}
-                                         : Handles(clusters[0], kvPropClst_FrmRefs)) {
+  for (uint32_t frame :
+       clusters.empty() ? std::vector<uint32_t>{} : Handles(clusters[0], kvPropClst_FrmRefs)) {
     if (Read<uint32_t>(frame, kvPropFrm_PayloadLen) > kClassicPayload) continue;
     const std::string frameName = Text(frame, kvPropFrm_Name);
     for (uint32_t handle : Handles(frame, kvPropFrm_SigRefs)) {
@@ -166,7 +165,10 @@ std::vector<tDriveSignal> PickDriveSignals(const std::string &path, size_t count
     signal.role = eRole::kOther;
     picked.push_back(signal);
   }
-  if (picked.empty()) error = path + ": no plain signal of a classic CAN frame";
+  if (picked.empty()) {
+    what = "no plain signal of a classic CAN frame in " + path;
+    status = kvErrDbObjectNotFound;
+  }
   return picked;
 }
 

@@ -30,9 +30,9 @@ struct tDriveSignal {
 
 // At most `count` plain signals of classic CAN frames of the database file at `path`: speed,
 // steering angle and gear first where the names tell them, then the rest in file order. Empty
-// with `error` set when the file gives none.
-std::vector<tDriveSignal> PickDriveSignals(const std::string &path, size_t count,
-                                           std::string &error);
+// when the file gives none, with `what` naming the failure and `status` its status.
+std::vector<tDriveSignal> PickDriveSignals(const std::string &path, size_t count, std::string &what,
+                                           int32_t &status);
 
 // The value of `signal` at `seconds` into a drive of `duration` seconds.
 double DriveValue(const tDriveSignal &signal, size_t index, double seconds, double duration);

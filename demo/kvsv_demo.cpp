@@ -50,8 +50,7 @@ void PrintFrames(const tDriveResult &r) {
 
 void PrintSignals(const tDriveResult &r) {
   std::printf("\nSignals read on %s (last step):\n  %-48s %12s %12s %12s  %s\n",
-              r.readInterface.c_str(), "signal", "written", "single point", "from frames",
-              "unit");
+              r.readInterface.c_str(), "signal", "written", "single point", "from frames", "unit");
   for (size_t i = 0; i < r.signals.size(); ++i) {
     const double converted = i < r.fromFrames.back().size() ? r.fromFrames.back()[i] : NAN;
     const double single = i < r.singlePoint.back().size() ? r.singlePoint.back()[i] : NAN;
@@ -66,12 +65,11 @@ void PrintCounts(const tDriveResult &r) {
   for (const auto &step : r.framesRead) read += step.size();
   for (const auto &signal : r.xyValues) pairs += signal.size();
   for (const auto &w : r.waveforms) samples += w.samples.size();
-  std::printf("\nDrive: %zu steps of %.0f ms, %zu signals\n", r.written.size(),
-              kStepSeconds * 1000, r.signals.size());
+  std::printf("\nDrive: %zu steps of %.0f ms, %zu signals\n", r.written.size(), kStepSeconds * 1000,
+              r.signals.size());
   std::printf("Frames: %zu written, %zu read\n", written, read);
   std::printf("Pairs read: %zu, waveform samples read: %zu\n", pairs, samples);
-  std::printf("Steady loop: %" PRIu64 " host allocations, %.2f us per frame\n",
-              r.steadyAllocations,
+  std::printf("Steady loop: %" PRIu64 " host allocations, %.2f us per frame\n", r.steadyAllocations,
               r.steadyFrames > 0 ? r.steadySeconds * 1e6 / r.steadyFrames : 0.0);
   std::printf("Program end: %d sessions opened, %d closed by the host, %d left open\n",
               r.sessionsOpened, r.closesAtEnd, r.sessionsLeftOpen);
@@ -81,8 +79,8 @@ bool WritePicture(const tDriveResult &r, const std::string &directory) {
   std::vector<tPlotCurve> curves;
   for (size_t i = 0; i < r.waveforms.size() && i < 2; ++i) {
     const tDriveSignal &s = r.signals[i];
-    curves.push_back({s.item + (s.unit.empty() ? "" : " (" + s.unit + ")"),
-                      r.waveforms[i].interval, r.waveforms[i].samples});
+    curves.push_back({s.item + (s.unit.empty() ? "" : " (" + s.unit + ")"), r.waveforms[i].interval,
+                      r.waveforms[i].samples});
   }
   std::filesystem::create_directories(directory);
   const std::string path = directory + "/signals.svg";

@@ -23,11 +23,20 @@ std::string Escape(const std::string &text) {
   std::string out;
   for (char c : text) {
     switch (c) {
-      case '&': out += "&amp;"; break;
-      case '<': out += "&lt;"; break;
-      case '>': out += "&gt;"; break;
-      case '"': out += "&quot;"; break;
-      default: out += c;
+      case '&':
+        out += "&amp;";
+        break;
+      case '<':
+        out += "&lt;";
+        break;
+      case '>':
+        out += "&gt;";
+        break;
+      case '"':
+        out += "&quot;";
+        break;
+      default:
+        out += c;
     }
   }
   return out;
@@ -80,8 +89,8 @@ std::string PlotSvg(const std::string &title, const std::vector<tPlotCurve> &cur
       svg += Text(axisX + (left ? -6 : 6), y + 4, left ? "end" : "start", colour,
                   Number(low + (high - low) * t / kTicks));
     }
-    svg += Text(left ? kLeft : kRight, kTop - 10 - 14.0 * (i / 2), left ? "start" : "end",
-                colour, c.label);
+    svg += Text(left ? kLeft : kRight, kTop - 10 - 14.0 * (i / 2), left ? "start" : "end", colour,
+                c.label);
     svg += "<polyline fill=\"none\" stroke=\"" + colour + "\" stroke-width=\"1.5\" points=\"";
     for (size_t k = 0; k < c.samples.size(); ++k) {
       const double x = kLeft + (kRight - kLeft) * (c.interval * k) / endTime;

@@ -8,7 +8,7 @@
 namespace kvsvdemo {
 
 struct tPlotCurve {
-  std::string label;  // name and unit, shown in the legend and on the curve's own axis
+  std::string label;      // name and unit, shown in the legend and on the curve's own axis
   double interval = 0.0;  // seconds between samples
   std::vector<double> samples;
 };

@@ -11,6 +11,7 @@
 #include <vector>
 
 #include "drive_scenario.h"
+#include "kvsim.h"
 #include "paths/paths_test_support.h"
 
 namespace {
@@ -95,7 +96,8 @@ TEST_P(DriveOnFieldFile, EverythingWrittenIsReadBack) {
     EXPECT_DOUBLE_EQ(w.interval, kStepSeconds);
     ASSERT_EQ(w.samples.size(), static_cast<size_t>(kSteps + 1));
     for (size_t j = 0; j < w.samples.size(); ++j) {
-      const uint64_t at = w.startRawTime + static_cast<uint64_t>(std::llround(j * w.interval * 1e7));
+      const uint64_t at =
+          w.startRawTime + static_cast<uint64_t>(std::llround(j * w.interval * 1e7));
       EXPECT_NEAR(w.samples[j], WrittenAt(r, i, at), r.signals[i].Tolerance()) << "sample " << j;
     }
   }
@@ -110,7 +112,8 @@ TEST_P(DriveOnFieldFile, EverythingWrittenIsReadBack) {
 INSTANTIATE_TEST_SUITE_P(FieldFiles, DriveOnFieldFile, testing::ValuesIn(FieldFiles()),
                          [](const testing::TestParamInfo<std::string> &info) {
                            std::string name = info.param.substr(0, info.param.find('.'));
-                           for (char &c : name) c = std::isalnum(static_cast<unsigned char>(c)) ? c : '_';
+                           for (char &c : name)
+                             c = std::isalnum(static_cast<unsigned char>(c)) ? c : '_';
                            return name;
                          });
 
@@ -146,12 +149,17 @@ TEST(Drive, AFailureNamesTheCallAndItsStatus) {
   const struct {
     const char *dbc;
     const char *interfaceName;
-  } cases[] = {{"no_such_file.dbc", "CAN1"}, {"tesla_can.dbc", "LIN1"}};
+    int32_t status;
+    const char *call;
+  } cases[] = {
+      {"no_such_file.dbc", "CAN1", kvsimErrDatabaseNotFound, "kvdbOpenDatabase "},
+      {"tesla_can.dbc", "LIN1", kvErrInternal, "no partner on the network of LIN1"},
+  };
   for (const auto &c : cases) {
     SCOPED_TRACE(c.dbc + std::string(" on ") + c.interfaceName);
     const tDriveResult r = Drive(c.dbc, c.interfaceName, directory);
-    EXPECT_LT(r.status, 0);
-    EXPECT_FALSE(r.failedCall.empty());
+    EXPECT_EQ(r.status, c.status);
+    EXPECT_EQ(r.failedCall.rfind(c.call, 0), 0u) << r.failedCall;
     EXPECT_FALSE(r.statusText.empty());
     EXPECT_TRUE(r.written.empty());
   }

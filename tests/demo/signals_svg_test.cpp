@@ -1,13 +1,13 @@
 // The picture of waveforms: one polyline per curve with a point per sample, every point inside
 // the plot, the time axis running left to right, and labels escaped for the document.
+#include "signals_svg.h"
+
 #include <gtest/gtest.h>
 
 #include <regex>
 #include <sstream>
 #include <string>
 #include <vector>
-
-#include "signals_svg.h"
 
 namespace {
 
@@ -46,7 +46,8 @@ TEST(SignalsSvg, EachCurveIsAPolylineInsideThePlot) {
   ASSERT_EQ(lines.size(), 2u);
   for (size_t c = 0; c < lines.size(); ++c) {
     ASSERT_EQ(lines[c].size(), curves[c].samples.size());
-    for (size_t k = 1; k < lines[c].size(); ++k) EXPECT_GT(lines[c][k].first, lines[c][k - 1].first);
+    for (size_t k = 1; k < lines[c].size(); ++k)
+      EXPECT_GT(lines[c][k].first, lines[c][k - 1].first);
     for (const auto &[x, y] : lines[c]) {
       EXPECT_GE(x, 80.0);
       EXPECT_LE(x, 720.0);
