@@ -46,10 +46,14 @@ const tProjectSession kSessions[kSessionCount] = {
 class cHostArrays {
  public:
   ~cHostArrays() {
-    for (auto &[handle, stride, inner] : arrays_) {
+    for (auto &[handle, stride, inner, extent] : arrays_) {
       if (handle == nullptr) continue;
-      const size_t capacity = stride == 0 ? 0 : (svGetHandleSize(handle) - 8) / stride;
-      for (size_t i = 0; i < capacity; ++i) {
+      int32_t count = 0;
+      std::memcpy(&count, *handle, 4);
+      const size_t held = stride == 0          ? 0
+                          : extent == kCounted ? static_cast<size_t>(std::max(count, 0))
+                                               : (svGetHandleSize(handle) - 8) / stride;
+      for (size_t i = 0; i < held; ++i) {
         for (uint32_t offset : inner) {
           SvHandle element;
           std::memcpy(&element, static_cast<uint8_t *>(*handle) + 8 + i * stride + offset, 8);
@@ -60,9 +64,13 @@ class cHostArrays {
     }
     for (SvWaveformArray *w : waveforms_) svsimDisposeWaveformArray(w);
   }
+  // Which elements own the handles they hold: every one the block has room for (the library
+  // keeps handles past the count for later reads), or only those of the count.
+  enum eExtent { kWholeBlock, kCounted };
   // `stride` and `inner`: the size of an element and where in it handles lie.
-  SvHandle &Track(uint32_t stride = 0, std::vector<uint32_t> inner = {}) {
-    arrays_.push_back({nullptr, stride, std::move(inner)});
+  SvHandle &Track(uint32_t stride = 0, std::vector<uint32_t> inner = {},
+                  eExtent extent = kWholeBlock) {
+    arrays_.push_back({nullptr, stride, std::move(inner), extent});
     return std::get<0>(arrays_.back());
   }
   SvWaveformArray *TrackWaveforms(SvWaveformArray *w) {
@@ -71,7 +79,7 @@ class cHostArrays {
   }
 
  private:
-  std::list<std::tuple<SvHandle, uint32_t, std::vector<uint32_t>>> arrays_;
+  std::list<std::tuple<SvHandle, uint32_t, std::vector<uint32_t>, eExtent>> arrays_;
   std::vector<SvWaveformArray *> waveforms_;
 };
 
@@ -164,9 +172,9 @@ class cDrive {
     SvHandle &values = arrays_.Track();
     values = svsimMakeDoubleArray(zeros.data(), static_cast<int32_t>(n));
     SvHandle &frames = arrays_.Track(kClusterSize, {kPayloadOffset});
-    SvHandle &spares = arrays_.Track(8, {0});
+    SvHandle &spares = arrays_.Track(8, {0}, cHostArrays::kCounted);
     SvHandle &expected = arrays_.Track(kClusterSize, {kPayloadOffset});
-    SvHandle &expectedSpares = arrays_.Track(8, {0});
+    SvHandle &expectedSpares = arrays_.Track(8, {0}, cHostArrays::kCounted);
     SvHandle &read = arrays_.Track();
     SvHandle &converted = arrays_.Track();
     const double duration = options_.steps * kStepSeconds;
