@@ -26,6 +26,7 @@ class FrameReadStream {
   std::mutex mutex_;
   std::optional<std::vector<uint8_t>> bytes_;
   bool repeat_ = false;
+  uint32_t records_ = 0;  // in the bytes, walked as the variable form
 };
 
 }  // namespace nKvorSim
