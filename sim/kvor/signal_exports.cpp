@@ -1,47 +1,19 @@
 // Signal calls: kvReadSignalSinglePoint, kvWriteSignalSinglePoint, kvhdnReadSignalWaveform,
 // kvhdnWriteSignalWaveform, kvReadSignalXY, kvWriteSignalXY.
-#include <memory>
-
 #include "driver.h"
-#include "driver_call.h"
 #include "driver_export.h"
 #include "kvsvplatform.h"
+#include "session_call.h"
 #include "signal_single_point.h"
 #include "signal_waveform.h"
 #include "signal_xy.h"
 
 using namespace nKvorSim;
 
-namespace {
-
-CallArgs SignalCall(const char *function, uint32_t session, uint32_t size1, uint32_t size2 = 0) {
-  CallArgs args;
-  args.function = function;
-  args.object = session;
-  args.size1 = size1;
-  args.size2 = size2;
-  return args;
-}
-
-// A signal call whose `body` works on the open session of `handle`; an error session answers with
-// its status.
-template <class Body>
-Status RunSignalCall(const CallArgs &args, uint32_t handle, Body &&body) {
-  return RunDriverCall(args, handle, [&](CallArgs &) -> Status {
-    Driver &driver = Driver::Instance();
-    std::shared_ptr<Session> session;
-    const Status status = driver.UseSession(handle, &session);
-    if (status != 0) return status;
-    return body(driver, *session);
-  });
-}
-
-}  // namespace
-
 KVOR_DRIVER_API int32_t kvReadSignalSinglePoint(uint32_t session, double *values,
                                                 uint32_t valuesSize, uint64_t *timestamps,
                                                 uint32_t timestampsSize) {
-  return RunSignalCall(SignalCall("kvReadSignalSinglePoint", session, valuesSize, timestampsSize),
+  return RunSessionCall(SessionCallArgs("kvReadSignalSinglePoint", session, valuesSize, timestampsSize),
                        session, [&](Driver &driver, Session &target) {
                          return ReadSignalSinglePoint(target, driver.Clock().Now(), values,
                                                       valuesSize, timestamps, timestampsSize);
@@ -50,7 +22,7 @@ KVOR_DRIVER_API int32_t kvReadSignalSinglePoint(uint32_t session, double *values
 
 KVOR_DRIVER_API int32_t kvWriteSignalSinglePoint(uint32_t session, const double *values,
                                                  uint32_t valuesSize) {
-  return RunSignalCall(SignalCall("kvWriteSignalSinglePoint", session, valuesSize), session,
+  return RunSessionCall(SessionCallArgs("kvWriteSignalSinglePoint", session, valuesSize), session,
                        [&](Driver &driver, Session &target) {
                          return WriteSignalSinglePoint(driver, target, values, valuesSize);
                        });
@@ -60,8 +32,8 @@ KVOR_DRIVER_API int32_t kvhdnReadSignalWaveform(uint32_t session, double timeout
                                                 uint64_t *startTime, double *interval,
                                                 double *const *buffers, uint32_t bufferSize,
                                                 uint32_t *numSamples) {
-  return RunSignalCall(
-      SignalCall("kvhdnReadSignalWaveform", session, bufferSize), session,
+  return RunSessionCall(
+      SessionCallArgs("kvhdnReadSignalWaveform", session, bufferSize), session,
       [&](Driver &driver, Session &target) {
         const tWaveformRead read{startTime, interval, buffers, bufferSize, numSamples};
         return ReadSignalWaveform(driver, target, timeout, read);
@@ -71,7 +43,7 @@ KVOR_DRIVER_API int32_t kvhdnReadSignalWaveform(uint32_t session, double timeout
 KVOR_DRIVER_API int32_t kvhdnWriteSignalWaveform(uint32_t session, double timeout,
                                                  const double *const *buffers,
                                                  uint32_t bufferSize) {
-  return RunSignalCall(SignalCall("kvhdnWriteSignalWaveform", session, bufferSize), session,
+  return RunSessionCall(SessionCallArgs("kvhdnWriteSignalWaveform", session, bufferSize), session,
                        [&](Driver &driver, Session &target) {
                          return WriteSignalWaveform(driver, target, timeout, buffers, bufferSize);
                        });
@@ -81,7 +53,7 @@ KVOR_DRIVER_API int32_t kvReadSignalXY(uint32_t session, const uint64_t *timeLim
                                        uint32_t valuesSize, uint64_t *timestamps,
                                        uint32_t timestampsSize, uint32_t *numPairs,
                                        uint32_t numPairsSize) {
-  return RunSignalCall(SignalCall("kvReadSignalXY", session, valuesSize, numPairsSize), session,
+  return RunSessionCall(SessionCallArgs("kvReadSignalXY", session, valuesSize, numPairsSize), session,
                        [&](Driver &driver, Session &target) {
                          const tXYRegions regions{values,         valuesSize, timestamps,
                                                   timestampsSize, numPairs,   numPairsSize};
@@ -93,7 +65,7 @@ KVOR_DRIVER_API int32_t kvWriteSignalXY(uint32_t session, double timeout, const 
                                         uint32_t valuesSize, const uint64_t *timestamps,
                                         uint32_t timestampsSize, const uint32_t *numPairs,
                                         uint32_t numPairsSize) {
-  return RunSignalCall(SignalCall("kvWriteSignalXY", session, valuesSize, numPairsSize), session,
+  return RunSessionCall(SessionCallArgs("kvWriteSignalXY", session, valuesSize, numPairsSize), session,
                        [&](Driver &driver, Session &target) {
                          // The regions are only read: the driver never writes a caller's input.
                          const tXYRegions regions{
