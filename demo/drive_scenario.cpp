@@ -2,9 +2,11 @@
 
 #include <algorithm>
 #include <chrono>
+#include <cmath>
 #include <cstring>
 #include <fstream>
 #include <list>
+#include <numeric>
 #include <tuple>
 
 #include "kvsim.h"
@@ -22,8 +24,9 @@ constexpr uint32_t kPayloadOffset = 16;
 constexpr uint32_t kIdentifierOffset = 24;
 constexpr int32_t kWaveformRate = 100;  // per second: one sample per step
 
-// The sessions of the project, as the session file names them.
-enum eSession { kDriveOut, kConvert, kFramesIn, kSignalsIn, kPairsIn, kWaveformIn, kSessionCount };
+// The sessions of the project beside the drive's own output sessions, as the session file names
+// them.
+enum eSession { kConvert, kFramesIn, kSignalsIn, kPairsIn, kWaveformIn, kSessionCount };
 
 struct tProjectSession {
   const char *name;
@@ -34,7 +37,6 @@ struct tProjectSession {
 };
 
 const tProjectSession kSessions[kSessionCount] = {
-    {"DriveOut", kvMode_SignalOutSinglePoint, false, true, 0},
     {"DriveConvert", kvMode_SignalConversionSinglePoint, false, true, 0},
     {"BusFrames", kvMode_FrameInQueued, true, false, 0},
     {"BusSignals", kvMode_SignalInSinglePoint, true, true, 0},
@@ -117,6 +119,7 @@ class cDrive {
     int32_t status = 0;
     r_.signals = PickDriveSignals(options_.dbcPath, options_.maxSignals, what, status);
     if (r_.signals.empty()) return Fail(what, status);
+    GroupByFrame();
     // A built application keeps its session file beside itself.
     svsimSetRunMode(1, 1, 1);
     svsimSetAppPath(options_.directory.c_str());
@@ -124,35 +127,74 @@ class cDrive {
     return WriteSessionFile();
   }
 
-  bool WriteSessionFile() {
-    std::string list;
-    for (const tDriveSignal &s : r_.signals) list += (list.empty() ? "" : ",") + s.item;
-    std::ofstream file(options_.directory + "/kvorSession.txt", std::ios::binary);
-    for (const tProjectSession &s : kSessions) {
-      file << s.name << "\n"
-           << s.mode << " " << s.rate << " 0 0 "
-           << (s.reads ? r_.readInterface : options_.interfaceName) << " "
-           << (s.signals ? list : "-") << " - " << options_.dbcPath << "\n\n";
+  // One output session per frame, so that each frame goes at its own cycle. The clock ticks at
+  // the largest period that divides every cycle, in whole milliseconds.
+  void GroupByFrame() {
+    constexpr int64_t kStepMs = 10;
+    int64_t tickMs = kStepMs;
+    std::vector<int64_t> cycleMs;
+    for (size_t i = 0; i < r_.signals.size(); ++i) {
+      const tDriveSignal &signal = r_.signals[i];
+      size_t g = 0;
+      while (g < r_.groups.size() && r_.groups[g].frameId != signal.frameId) ++g;
+      if (g == r_.groups.size()) {
+        tFrameGroup group;
+        group.session = "Drive_" + signal.item.substr(0, signal.item.find('.'));
+        group.frameId = signal.frameId;
+        r_.groups.push_back(group);
+        const int64_t ms = std::llround(signal.cycleSeconds * 1000);
+        cycleMs.push_back(ms > 0 ? ms : kStepMs);
+        tickMs = std::gcd(tickMs, cycleMs.back());
+      }
+      r_.groups[g].signals.push_back(i);
+      r_.groupOf.push_back(g);
     }
+    for (size_t g = 0; g < r_.groups.size(); ++g)
+      r_.groups[g].cycleTicks = static_cast<int32_t>(cycleMs[g] / tickMs);
+    r_.tickSeconds = static_cast<double>(tickMs) / 1000;
+    ticks_ = static_cast<size_t>(std::max(options_.steps, 0)) * static_cast<size_t>(kStepMs / tickMs);
+  }
+
+  bool WriteSessionFile() {
+    std::string all;
+    for (const tDriveSignal &s : r_.signals) all += (all.empty() ? "" : ",") + s.item;
+    std::ofstream file(options_.directory + "/kvorSession.txt", std::ios::binary);
+    const auto entry = [&](const std::string &name, int32_t mode, int32_t rate, bool reads,
+                           const std::string &list) {
+      file << name << "\n"
+           << mode << " " << rate << " 0 0 " << (reads ? r_.readInterface : options_.interfaceName)
+           << " " << list << " - " << options_.dbcPath << "\n\n";
+    };
+    for (const tFrameGroup &g : r_.groups) {
+      std::string list;
+      for (size_t i : g.signals) list += (list.empty() ? "" : ",") + r_.signals[i].item;
+      entry(g.session, kvMode_SignalOutSinglePoint, 0, false, list);
+    }
+    for (const tProjectSession &s : kSessions) entry(s.name, s.mode, s.rate, s.reads, s.signals ? all : "-");
     file.close();
     return !file.fail() || Fail("write of the session file", kvErrSessionFile);
   }
 
   bool OpenSessions() {
-    for (int i = 0; i < kSessionCount; ++i) {
-      SvHandle name = svsimMakeString(kSessions[i].name);
+    std::vector<std::string> names;
+    for (const tFrameGroup &g : r_.groups) names.push_back(g.session);
+    for (const tProjectSession &s : kSessions) names.emplace_back(s.name);
+    handles_.assign(names.size(), 0);
+    for (size_t i = 0; i < names.size(); ++i) {
+      SvHandle name = svsimMakeString(names[i].c_str());
       lib_.sessionOpen(&name, &handles_[i], 0);
       Register(name, handles_[i]);
       svDisposeHandle(name);
       // The open always succeeds for the host; a failure shows at the session's first use.
       uint32_t size = 0;
       const int32_t status = kvGetPropertySize(handles_[i], kvPropSession_IntfName, &size);
-      if (!Check((std::string("kvsvSessionOpen ") + kSessions[i].name).c_str(), status))
-        return false;
+      if (!Check(("kvsvSessionOpen " + names[i]).c_str(), status)) return false;
       ++r_.sessionsOpened;
     }
     return true;
   }
+
+  uint32_t Session(eSession s) const { return handles_[r_.groups.size() + s]; }
 
   // The host keeps a reference for each session it opened, to close it when the program ends.
   static void Register(SvHandle name, uint32_t handle) {
@@ -169,8 +211,15 @@ class cDrive {
   void Play() {
     const size_t n = r_.signals.size();
     std::vector<double> zeros(n, 0.0);
+    // Every signal's value in force, for the conversion; and each frame's own.
     SvHandle &values = arrays_.Track();
     values = svsimMakeDoubleArray(zeros.data(), static_cast<int32_t>(n));
+    std::vector<SvHandle *> groupValues;
+    for (const tFrameGroup &g : r_.groups) {
+      SvHandle &array = arrays_.Track();
+      array = svsimMakeDoubleArray(zeros.data(), static_cast<int32_t>(g.signals.size()));
+      groupValues.push_back(&array);
+    }
     SvHandle &frames = arrays_.Track(kClusterSize, {kPayloadOffset});
     SvHandle &spares = arrays_.Track(8, {0}, cHostArrays::kCounted);
     SvHandle &expected = arrays_.Track(kClusterSize, {kPayloadOffset});
@@ -179,37 +228,51 @@ class cDrive {
     SvHandle &converted = arrays_.Track();
     const double duration = options_.steps * kStepSeconds;
     std::chrono::steady_clock::time_point start;
-    for (int32_t step = 0; step < options_.steps; ++step) {
-      // The first step sizes every host array; from the second on nothing should be allocated.
-      if (step == 1) {
+    std::vector<uint32_t> due;
+    for (size_t tick = 0; tick < ticks_; ++tick) {
+      // Every frame goes at the first tick, which sizes every host array; from the second tick
+      // on nothing should be allocated.
+      if (tick == 1) {
         svsimResetCounters();
         start = std::chrono::steady_clock::now();
       }
-      kvsimAdvanceClock(static_cast<uint64_t>(kStepSeconds * kRawPerSecond));
+      kvsimAdvanceClock(static_cast<uint64_t>(std::llround(r_.tickSeconds * kRawPerSecond)));
       r_.writeTimes.push_back(kvsimClock());
-      double *out = reinterpret_cast<double *>(static_cast<uint8_t *>(*values) + 8);
-      for (size_t i = 0; i < n; ++i)
-        out[i] = DriveValue(r_.signals[i], i, (step + 1) * kStepSeconds, duration);
-      r_.written.emplace_back(out, out + n);
-      if (!Check("kvsvWriteSignalSinglePoint",
-                 lib_.writeSignalSinglePoint(handles_[kDriveOut], values)) ||
-          !Check("kvsvReadFrameCAN",
-                 lib_.readFrameCAN(handles_[kFramesIn], -1, &frames, &spares, 0.0)) ||
+      const double seconds = static_cast<double>(tick + 1) * r_.tickSeconds;
+      double *all = DoubleData(values);
+      due.clear();
+      for (size_t g = 0; g < r_.groups.size(); ++g) {
+        const tFrameGroup &group = r_.groups[g];
+        if (!group.DueAt(tick)) continue;
+        double *out = DoubleData(*groupValues[g]);
+        for (size_t k = 0; k < group.signals.size(); ++k) {
+          const size_t i = group.signals[k];
+          out[k] = all[i] = DriveValue(r_.signals[i], i, seconds, duration);
+        }
+        if (!Check("kvsvWriteSignalSinglePoint",
+                   lib_.writeSignalSinglePoint(handles_[g], *groupValues[g])))
+          return;
+        due.push_back(group.frameId);
+      }
+      r_.written.emplace_back(all, all + n);
+      if (!Check("kvsvReadFrameCAN",
+                 lib_.readFrameCAN(Session(kFramesIn), -1, &frames, &spares, 0.0)) ||
           !Check("kvsvReadSignalSinglePoint",
-                 lib_.readSignalSinglePoint(handles_[kSignalsIn], &read)) ||
+                 lib_.readSignalSinglePoint(Session(kSignalsIn), &read)) ||
           !Check("kvsvConvertSignalSinglePointToFrameCAN",
-                 lib_.convertSignalsToFrameCAN(handles_[kConvert], &values, &expected,
+                 lib_.convertSignalsToFrameCAN(Session(kConvert), &values, &expected,
                                                &expectedSpares)) ||
           !Check("kvsvConvertFrameCANToSignalSinglePoint",
-                 lib_.convertFrameCANToSignals(handles_[kConvert], &frames, &converted)))
+                 lib_.convertFrameCANToSignals(Session(kConvert), &frames, &converted)))
         return;
       r_.framesRead.push_back(Frames(frames));
-      r_.framesExpected.push_back(Frames(expected));
+      // The conversion makes every frame; only those that went this tick are on the bus.
+      r_.framesExpected.push_back(Frames(expected, &due));
       r_.singlePoint.push_back(Doubles(read));
       r_.fromFrames.push_back(Doubles(converted));
-      if (step >= 1) r_.steadyFrames += static_cast<int32_t>(r_.framesRead.back().size());
+      if (tick >= 1) r_.steadyFrames += static_cast<int32_t>(r_.framesRead.back().size());
     }
-    if (options_.steps > 1) {
+    if (ticks_ > 1) {
       r_.steadySeconds =
           std::chrono::duration<double>(std::chrono::steady_clock::now() - start).count();
       r_.steadyAllocations = svsimAllocCount() + svsimResizeCount();
@@ -218,7 +281,7 @@ class cDrive {
 
   void ReadPairs() {
     SvHandle &clusters = arrays_.Track(16, {0, 8});
-    if (!Check("kvsvReadSignalXY", lib_.readSignalXY(handles_[kPairsIn], -1, nullptr, &clusters)))
+    if (!Check("kvsvReadSignalXY", lib_.readSignalXY(Session(kPairsIn), -1, nullptr, &clusters)))
       return;
     const int32_t count = Count(clusters);
     for (int32_t i = 0; i < count; ++i) {
@@ -243,7 +306,7 @@ class cDrive {
     // The grid starts at the open: one instant there and one after each step.
     const int32_t samples = options_.steps + 1;
     if (!Check("kvsvReadSignalWaveform",
-               lib_.readSignalWaveform(handles_[kWaveformIn], samples, array, 0.0)))
+               lib_.readSignalWaveform(Session(kWaveformIn), samples, array, 0.0)))
       return;
     for (int32_t i = 0; i < svsimWaveformCount(array); ++i) {
       tWaveform w;
@@ -269,11 +332,15 @@ class cDrive {
     if (array != nullptr) std::memcpy(&count, *array, 4);
     return count;
   }
+  static double *DoubleData(SvHandle array) {
+    return reinterpret_cast<double *>(static_cast<uint8_t *>(*array) + 8);
+  }
   static std::vector<double> Doubles(SvHandle array) {
-    const double *first = reinterpret_cast<const double *>(static_cast<uint8_t *>(*array) + 8);
+    const double *first = DoubleData(array);
     return std::vector<double>(first, first + Count(array));
   }
-  std::vector<tFrame> Frames(SvHandle array) const {
+  // The frames of a cluster array; with `only`, those of the identifiers it names.
+  std::vector<tFrame> Frames(SvHandle array, const std::vector<uint32_t> *only = nullptr) const {
     std::vector<tFrame> frames;
     for (int32_t i = 0; i < Count(array); ++i) {
       const uint8_t *c = static_cast<uint8_t *>(*array) + 8 + i * kClusterSize;
@@ -290,6 +357,8 @@ class cDrive {
         const uint8_t *block = static_cast<uint8_t *>(*payload);
         f.payload.assign(block + 4, block + 4 + Count(payload));
       }
+      if (only != nullptr && std::find(only->begin(), only->end(), f.identifier) == only->end())
+        continue;
       frames.push_back(std::move(f));
     }
     return frames;
@@ -298,7 +367,8 @@ class cDrive {
   const tLibraryExports &lib_;
   const tDriveOptions &options_;
   tDriveResult &r_;
-  uint32_t handles_[kSessionCount] = {};
+  std::vector<uint32_t> handles_;  // the frames' output sessions, then those of eSession
+  size_t ticks_ = 0;
   cHostArrays arrays_;
 };
 

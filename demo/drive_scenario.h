@@ -17,11 +17,22 @@ struct tDriveOptions {
   std::string dbcPath;
   std::string interfaceName = "CAN1";  // the drive plays here; its partner on the network reads
   std::string directory;               // the program's own directory: the session file goes here
-  int32_t steps = 300;                 // of kStepSeconds each
+  int32_t steps = 300;                 // the drive lasts this many kStepSeconds
   size_t maxSignals = 6;
 };
 
+// A frame goes every kStepSeconds where the database gives it no cycle time of its own.
 constexpr double kStepSeconds = 0.01;
+
+// The signals of one frame, written together by an output session of their own at the frame's
+// cycle.
+struct tFrameGroup {
+  std::string session;
+  uint32_t frameId = 0;
+  int32_t cycleTicks = 1;  // the frame goes at every tick that is a multiple of this
+  std::vector<size_t> signals;
+  bool DueAt(size_t tick) const { return tick % static_cast<size_t>(cycleTicks) == 0; }
+};
 
 // One CAN frame as a host cluster holds it.
 struct tFrame {
@@ -50,18 +61,25 @@ struct tDriveResult {
 
   std::string readInterface;
   std::vector<tDriveSignal> signals;
-  std::vector<uint64_t> writeTimes;                 // raw clock of each write
-  std::vector<std::vector<double>> written;         // [step][signal]
-  std::vector<std::vector<double>> singlePoint;     // read after each write
-  std::vector<std::vector<double>> fromFrames;      // the frames of each step converted back
-  std::vector<std::vector<tFrame>> framesRead;      // per step
-  std::vector<std::vector<tFrame>> framesExpected;  // per step, from the conversion session
+  std::vector<tFrameGroup> groups;
+  std::vector<size_t> groupOf;  // [signal]
+  // The drive's clock ticks at the largest period that every cycle time is a whole multiple of.
+  double tickSeconds = kStepSeconds;
+  std::vector<uint64_t> writeTimes;                 // raw clock of each tick
+  std::vector<std::vector<double>> written;         // [tick][signal], the value last written
+  std::vector<std::vector<double>> singlePoint;     // read after each tick
+  std::vector<std::vector<double>> fromFrames;      // the frames of each tick converted back
+  std::vector<std::vector<tFrame>> framesRead;      // per tick
+  std::vector<std::vector<tFrame>> framesExpected;  // per tick, from the conversion session
   std::vector<std::vector<uint64_t>> xyTimes;       // [signal][pair]
   std::vector<std::vector<double>> xyValues;
   std::vector<tWaveform> waveforms;  // one per signal
 
   uint64_t steadyAllocations = 0;  // host allocations and resizes after the first step
   int32_t steadyFrames = 0;
+
+  // Whether the frame of `signal` went at `tick`.
+  bool WrittenAt(size_t signal, size_t tick) const { return groups[groupOf[signal]].DueAt(tick); }
   double steadySeconds = 0.0;
   int32_t sessionsOpened = 0;
   int32_t closesAtEnd = 0;       // references the host closed when the program ended

@@ -118,6 +118,8 @@ std::vector<tDriveSignal> PickDriveSignals(const std::string &path, size_t count
        clusters.empty() ? std::vector<uint32_t>{} : Handles(clusters[0], kvPropClst_FrmRefs)) {
     if (Read<uint32_t>(frame, kvPropFrm_PayloadLen) > kClassicPayload) continue;
     const std::string frameName = Text(frame, kvPropFrm_Name);
+    const uint32_t frameId = Read<uint32_t>(frame, kvPropFrm_ID);
+    const double cycleSeconds = Read<double>(frame, kvPropFrm_CANTxTime);
     for (uint32_t handle : Handles(frame, kvPropFrm_SigRefs)) {
       const uint32_t type = Read<uint32_t>(handle, kvPropSig_DataType);
       if (type > 1 || Read<uint8_t>(handle, kvPropSig_MuxIsDynamic) != 0 ||
@@ -127,6 +129,8 @@ std::vector<tDriveSignal> PickDriveSignals(const std::string &path, size_t count
       const std::string name = Text(handle, kvPropSig_Name);
       signal.item = frameName + "." + name;
       signal.unit = Text(handle, kvPropSig_Unit);
+      signal.frameId = frameId;
+      signal.cycleSeconds = cycleSeconds;
       signal.role = RoleOf(name);
       signal.scale = Read<double>(handle, kvPropSig_ScaleFac);
       signal.offset = Read<double>(handle, kvPropSig_ScaleOff);

@@ -14,6 +14,8 @@ enum class eRole { kSpeed, kSteering, kGear, kOther };
 struct tDriveSignal {
   std::string item;  // "frame.signal", as session lists name it
   std::string unit;
+  uint32_t frameId = 0;       // of the frame that carries it
+  double cycleSeconds = 0.0;  // the frame's cycle time in the database; 0 where it gives none
   eRole role = eRole::kOther;
   double scale = 1.0;
   double offset = 0.0;

@@ -65,8 +65,12 @@ void PrintCounts(const tDriveResult &r) {
   for (const auto &step : r.framesRead) read += step.size();
   for (const auto &signal : r.xyValues) pairs += signal.size();
   for (const auto &w : r.waveforms) samples += w.samples.size();
-  std::printf("\nDrive: %zu steps of %.0f ms, %zu signals\n", r.written.size(), kStepSeconds * 1000,
-              r.signals.size());
+  std::printf("\nDrive: %zu ticks of %.0f ms, %zu signals in %zu frames\n", r.written.size(),
+              r.tickSeconds * 1000, r.signals.size(), r.groups.size());
+  for (const tFrameGroup &g : r.groups) {
+    std::printf("  0x%-8" PRIX32 " every %4.0f ms  %s\n", g.frameId,
+                g.cycleTicks * r.tickSeconds * 1000, g.session.c_str());
+  }
   std::printf("Frames: %zu written, %zu read\n", written, read);
   std::printf("Pairs read: %zu, waveform samples read: %zu\n", pairs, samples);
   std::printf("Steady loop: %" PRIu64 " host allocations, %.2f us per frame\n", r.steadyAllocations,

@@ -7,6 +7,7 @@
 #include <algorithm>
 #include <cmath>
 #include <filesystem>
+#include <fstream>
 #include <string>
 #include <vector>
 
@@ -32,7 +33,7 @@ std::vector<std::string> FieldFiles() {
 tDriveResult Drive(const std::string &dbc, const std::string &interfaceName,
                    const kvsvtest::cTempDir &directory) {
   tDriveOptions options;
-  options.dbcPath = std::string(KVSV_DBC_DIR) + "/" + dbc;
+  options.dbcPath = dbc.find('/') == std::string::npos ? std::string(KVSV_DBC_DIR) + "/" + dbc : dbc;
   options.interfaceName = interfaceName;
   options.directory = directory.Path();
   options.steps = kSteps;
@@ -47,24 +48,25 @@ double WrittenAt(const tDriveResult &r, size_t signal, uint64_t rawTime) {
   return value;
 }
 
-class DriveOnFieldFile : public testing::TestWithParam<std::string> {};
-
-TEST_P(DriveOnFieldFile, EverythingWrittenIsReadBack) {
-  kvsvtest::cTempDir directory;
-  const tDriveResult r = Drive(GetParam(), "CAN1", directory);
-  ASSERT_EQ(r.status, 0) << r.failedCall << ": " << r.statusText;
+// Every frame that went arrives as the conversion makes it, and every value read back, single
+// point, from the frames, as pairs and as waveform samples, is the one in force.
+void ExpectEverythingReadBack(const tDriveResult &r) {
   ASSERT_FALSE(r.signals.empty());
-  ASSERT_EQ(r.written.size(), static_cast<size_t>(kSteps));
+  const size_t ticks = static_cast<size_t>(std::llround(kSteps * kStepSeconds / r.tickSeconds));
+  ASSERT_EQ(r.written.size(), ticks);
   const size_t n = r.signals.size();
 
   // The drive moves: a check against values that never change would prove little.
   size_t moving = 0;
-  for (size_t i = 0; i < n; ++i) moving += r.written.front()[i] != r.written[kSteps / 2][i];
+  for (size_t i = 0; i < n; ++i) moving += r.written.front()[i] != r.written[ticks / 2][i];
   EXPECT_GT(moving, 0u);
 
   for (size_t k = 0; k < r.written.size(); ++k) {
-    SCOPED_TRACE("step " + std::to_string(k));
-    ASSERT_FALSE(r.framesExpected[k].empty());
+    SCOPED_TRACE("tick " + std::to_string(k));
+    // At a tick with no frame due the bus carries nothing.
+    bool due = false;
+    for (const tFrameGroup &g : r.groups) due = due || g.DueAt(k);
+    ASSERT_EQ(r.framesExpected[k].empty(), !due);
     ASSERT_EQ(r.framesRead[k].size(), r.framesExpected[k].size());
     for (size_t f = 0; f < r.framesRead[k].size(); ++f) {
       EXPECT_TRUE(r.framesRead[k][f].SameContent(r.framesExpected[k][f])) << "frame " << f;
@@ -75,18 +77,28 @@ TEST_P(DriveOnFieldFile, EverythingWrittenIsReadBack) {
     for (size_t i = 0; i < n; ++i) {
       EXPECT_NEAR(r.singlePoint[k][i], r.written[k][i], r.signals[i].Tolerance())
           << r.signals[i].item;
-      EXPECT_NEAR(r.fromFrames[k][i], r.written[k][i], r.signals[i].Tolerance())
-          << r.signals[i].item;
+      // A frame that did not go this tick is not among those converted back.
+      if (r.WrittenAt(i, k)) {
+        EXPECT_NEAR(r.fromFrames[k][i], r.written[k][i], r.signals[i].Tolerance())
+            << r.signals[i].item;
+      }
     }
   }
 
   ASSERT_EQ(r.xyValues.size(), n);
   for (size_t i = 0; i < n; ++i) {
     SCOPED_TRACE(r.signals[i].item);
-    ASSERT_EQ(r.xyValues[i].size(), static_cast<size_t>(kSteps));
-    EXPECT_EQ(r.xyTimes[i], r.writeTimes);
-    for (size_t k = 0; k < r.xyValues[i].size(); ++k)
-      EXPECT_NEAR(r.xyValues[i][k], r.written[k][i], r.signals[i].Tolerance()) << "pair " << k;
+    std::vector<uint64_t> times;
+    std::vector<double> values;
+    for (size_t k = 0; k < ticks; ++k) {
+      if (!r.WrittenAt(i, k)) continue;
+      times.push_back(r.writeTimes[k]);
+      values.push_back(r.written[k][i]);
+    }
+    EXPECT_EQ(r.xyTimes[i], times);
+    ASSERT_EQ(r.xyValues[i].size(), values.size());
+    for (size_t k = 0; k < values.size(); ++k)
+      EXPECT_NEAR(r.xyValues[i][k], values[k], r.signals[i].Tolerance()) << "pair " << k;
   }
 
   ASSERT_EQ(r.waveforms.size(), n);
@@ -104,9 +116,22 @@ TEST_P(DriveOnFieldFile, EverythingWrittenIsReadBack) {
 
   EXPECT_EQ(r.steadyAllocations, 0u);
   EXPECT_GT(r.steadyFrames, 0);
-  EXPECT_EQ(r.sessionsOpened, 6);
+  // One output session per frame, then the five that read and convert.
+  EXPECT_EQ(r.sessionsOpened, static_cast<int32_t>(r.groups.size()) + 5);
   EXPECT_EQ(r.closesAtEnd, r.sessionsOpened);
   EXPECT_EQ(r.sessionsLeftOpen, 0);
+}
+
+class DriveOnFieldFile : public testing::TestWithParam<std::string> {};
+
+// The field's files give no cycle times: every frame goes every step.
+TEST_P(DriveOnFieldFile, EverythingWrittenIsReadBack) {
+  kvsvtest::cTempDir directory;
+  const tDriveResult r = Drive(GetParam(), "CAN1", directory);
+  ASSERT_EQ(r.status, 0) << r.failedCall << ": " << r.statusText;
+  EXPECT_DOUBLE_EQ(r.tickSeconds, kStepSeconds);
+  for (const tFrameGroup &g : r.groups) EXPECT_EQ(g.cycleTicks, 1) << g.session;
+  ExpectEverythingReadBack(r);
 }
 
 INSTANTIATE_TEST_SUITE_P(FieldFiles, DriveOnFieldFile, testing::ValuesIn(FieldFiles()),
@@ -116,6 +141,40 @@ INSTANTIATE_TEST_SUITE_P(FieldFiles, DriveOnFieldFile, testing::ValuesIn(FieldFi
                              c = std::isalnum(static_cast<unsigned char>(c)) ? c : '_';
                            return name;
                          });
+
+// A frame goes at the cycle time its database gives it; the clock ticks at the period that
+// divides them all.
+TEST(Drive, FramesGoAtTheirCycleTimes) {
+  kvsvtest::cTempDir directory;
+  const std::string dbc = directory.Path() + "/tesla_cycles.dbc";
+  {
+    std::ifstream in(std::string(KVSV_DBC_DIR) + "/tesla_can.dbc", std::ios::binary);
+    std::ofstream out(dbc, std::ios::binary);
+    out << in.rdbuf()
+        << "\nBA_DEF_ BO_ \"GenMsgCycleTime\" INT 0 65535;\n"
+           "BA_DEF_DEF_ \"GenMsgCycleTime\" 0;\n"
+           "BA_ \"GenMsgCycleTime\" BO_ 280 20;\n"    // DI_torque2, 0x118
+           "BA_ \"GenMsgCycleTime\" BO_ 1160 15;\n";  // DAS_steeringControl, 0x488
+  }
+  const tDriveResult r = Drive(dbc, "CAN1", directory);
+  ASSERT_EQ(r.status, 0) << r.failedCall << ": " << r.statusText;
+  EXPECT_DOUBLE_EQ(r.tickSeconds, 0.005);
+  ASSERT_EQ(r.groups.size(), 2u);
+  EXPECT_EQ(r.groups[0].frameId, 0x118u);
+  EXPECT_EQ(r.groups[0].cycleTicks, 4);
+  EXPECT_EQ(r.groups[1].frameId, 0x488u);
+  EXPECT_EQ(r.groups[1].cycleTicks, 3);
+  // Each frame on the bus as often as its cycle says: first at tick 0, then every cycle.
+  const size_t ticks = r.written.size();
+  for (size_t g = 0; g < 2; ++g) {
+    size_t seen = 0;
+    for (const std::vector<tFrame> &tick : r.framesRead)
+      for (const tFrame &f : tick) seen += f.identifier == r.groups[g].frameId;
+    const size_t cycle = static_cast<size_t>(r.groups[g].cycleTicks);
+    EXPECT_EQ(seen, (ticks + cycle - 1) / cycle) << r.groups[g].session;
+  }
+  ExpectEverythingReadBack(r);
+}
 
 TEST(Drive, TheOtherNetworkCarriesItToo) {
   kvsvtest::cTempDir directory;
