@@ -29,6 +29,8 @@ TEST_F(KvorCallLog, EachCallIsRecordedWithItsArgumentsAndResult) {
   ASSERT_EQ(kvStop(session, 7), kvsimErrInvalidScope);
   uint32_t error = 0;
   ASSERT_EQ(kvhdnCreateErrorSession(kvsimErrUnknownInterface, &error), 0);
+  ASSERT_EQ(kvdbCloseDatabase(session, 1), kvsimErrInvalidDatabase);
+  EXPECT_EQ(kvsimOpenSessionCount(), 2) << "a session handle is not closed as a database";
 
   const struct {
     const char *function;
@@ -44,6 +46,7 @@ TEST_F(KvorCallLog, EachCallIsRecordedWithItsArgumentsAndResult) {
       {"kvStop", session, 0, 7, 0, kvsimErrInvalidScope, ""},
       {"kvhdnCreateErrorSession", error, 0, static_cast<uint32_t>(kvsimErrUnknownInterface), 0, 0,
        ""},
+      {"kvdbCloseDatabase", session, 0, 1, 0, kvsimErrInvalidDatabase, ""},
   };
   ASSERT_EQ(kvsimLogCount(), static_cast<int32_t>(std::size(expected)));
   for (size_t i = 0; i < std::size(expected); ++i) {

@@ -3,7 +3,7 @@
 #include <algorithm>
 #include <cmath>
 
-#include "frame_test_support.h"
+#include "kvor_test_support.h"
 
 namespace {
 

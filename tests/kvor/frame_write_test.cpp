@@ -5,7 +5,7 @@
 #include <algorithm>
 #include <cmath>
 
-#include "frame_test_support.h"
+#include "kvor_test_support.h"
 
 namespace {
 
@@ -77,21 +77,6 @@ TEST_F(KvorFrameWrite, AMalformedBufferIsRefusedWholeAndReadNoFurtherThanItsEnd)
     EXPECT_EQ(kvsimLastWrite(writer, last.data(), 64), 24) << "the last good write stays";
     EXPECT_EQ(last[8], 9);
   }
-}
-
-TEST_F(KvorFrameWrite, TheLastWriteKeepsTheBytesAsGiven) {
-  const uint32_t writer = Create("FlexRay2", kvMode_FrameOutStream);
-  EXPECT_EQ(kvsimLastWrite(writer, nullptr, 0), 0) << "nothing written yet";
-  const std::vector<uint8_t> bytes =
-      Pack({{0x10, Pattern(30, 1), 0x04, 0xB7, 0x33, 555}, {0x11, {}, 0x00, 0x01, 0x00, 0}});
-  ASSERT_EQ(kvWriteFrame(writer, bytes.data(), static_cast<uint32_t>(bytes.size()), 0.0), 0);
-  std::vector<uint8_t> copy(bytes.size());
-  EXPECT_EQ(kvsimLastWrite(writer, copy.data(), static_cast<uint32_t>(copy.size())), 72);
-  EXPECT_EQ(copy, bytes);
-  uint8_t head[10] = {};
-  EXPECT_EQ(kvsimLastWrite(writer, head, 10), 72) << "a short buffer gets the start";
-  EXPECT_TRUE(std::equal(head, head + 10, bytes.begin()));
-  EXPECT_EQ(kvsimLastWrite(Create("FlexRay2", kvMode_FrameInStream), copy.data(), 1), -1);
 }
 
 TEST_F(KvorFrameWrite, ASinkKeepsEveryWriteUncheckedAndSendsNothing) {

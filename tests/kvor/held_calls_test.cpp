@@ -4,7 +4,6 @@
 #include <future>
 #include <vector>
 
-#include "control_calls.h"
 #include "kvor_test_support.h"
 
 namespace {

@@ -8,21 +8,27 @@ namespace {
 
 using KvorSessionCreate = KvorTest;
 
-TEST_F(KvorSessionCreate, InterfacesAreCheckedAgainstTheSystem) {
+TEST_F(KvorSessionCreate, InterfacesAreCheckedAgainstTheSystemAndTheDefinitionIsKept) {
   const struct {
     const char *name;
     uint32_t protocol;
-  } known[] = {{"LIN2", kvProtocol_LIN},
-               {"can2", kvProtocol_CAN},
-               {"flexray2", kvProtocol_FlexRay},
-               {"ENET1/monitor", kvProtocol_Ethernet},
-               {"CAN1/monitor", kvProtocol_CAN}};
+    const char *database, *cluster;  // null: none given, which reads as empty
+  } known[] = {{"LIN2", kvProtocol_LIN, "DB", "Cluster"},
+               {"can2", kvProtocol_CAN, nullptr, nullptr},
+               {"flexray2", kvProtocol_FlexRay, "Powertrain.dbc", "HS-CAN"},
+               {"ENET1/monitor", kvProtocol_Ethernet, "DB", "Cluster"},
+               {"CAN1/monitor", kvProtocol_CAN, "DB", "Cluster"}};
   for (const auto &c : known) {
     SCOPED_TRACE(c.name);
     uint32_t handle = 0;
-    ASSERT_EQ(kvCreateSession("DB", "Cluster", "", c.name, kvMode_FrameInStream, &handle), 0);
+    ASSERT_EQ(kvCreateSession(c.database, c.cluster, nullptr, c.name, kvMode_SignalOutXY, &handle),
+              0);
     EXPECT_EQ(ReadU32(handle, kvPropSession_Protocol), c.protocol);
     EXPECT_EQ(ReadText(handle, kvPropSession_IntfName), c.name) << "the name as it was given";
+    EXPECT_EQ(ReadText(handle, kvPropSession_DatabaseName), c.database ? c.database : "");
+    EXPECT_EQ(ReadText(handle, kvPropSession_ClusterName), c.cluster ? c.cluster : "");
+    EXPECT_EQ(ReadU32(handle, kvPropSession_Mode), uint32_t{kvMode_SignalOutXY});
+    EXPECT_EQ(ReadU32(handle, kvPropSession_NumInList), 0u);
     EXPECT_EQ(kvClear(handle), 0);
   }
   for (const char *name : {"CAN5", "CAN", "", "CAN1/", "/monitor", " CAN1"}) {
@@ -32,6 +38,9 @@ TEST_F(KvorSessionCreate, InterfacesAreCheckedAgainstTheSystem) {
         << '"' << name << '"';
     EXPECT_EQ(handle, 0xABCD0123u) << "a failed creation leaves the output alone";
   }
+  uint32_t handle = 0;
+  EXPECT_EQ(kvCreateSession("DB", "Cluster", "A", nullptr, 0, &handle), kvsimErrNullPointer);
+  EXPECT_EQ(kvCreateSession("DB", "Cluster", "A", "CAN1", 0, nullptr), kvsimErrNullPointer);
   EXPECT_EQ(kvsimOpenSessionCount(), 0);
 }
 
@@ -61,24 +70,6 @@ TEST_F(KvorSessionCreate, TheListIsCutAtCommasAndTrimmed) {
     EXPECT_EQ(ReadU32(handle, kvPropSession_NumInList), c.count);
     EXPECT_EQ(ReadText(handle, kvPropSession_List), c.normalised);
   }
-}
-
-TEST_F(KvorSessionCreate, ASessionTellsItsDefinitionAndAbsentTextsAreEmpty) {
-  uint32_t handle = 0;
-  ASSERT_EQ(kvCreateSession("Powertrain.dbc", "HS-CAN", "RPM,Torque", "ENET1/monitor",
-                            kvMode_SignalOutSinglePoint, &handle),
-            0);
-  EXPECT_EQ(ReadText(handle, kvPropSession_DatabaseName), "Powertrain.dbc");
-  EXPECT_EQ(ReadText(handle, kvPropSession_ClusterName), "HS-CAN");
-  EXPECT_EQ(ReadU32(handle, kvPropSession_Mode), uint32_t{kvMode_SignalOutSinglePoint});
-
-  EXPECT_EQ(kvCreateSession("DB", "Cluster", "A", nullptr, 0, &handle), kvsimErrNullPointer);
-  EXPECT_EQ(kvCreateSession("DB", "Cluster", "A", "CAN1", 0, nullptr), kvsimErrNullPointer);
-  EXPECT_EQ(kvsimOpenSessionCount(), 1);
-  ASSERT_EQ(kvCreateSession(nullptr, nullptr, nullptr, "CAN1", 0, &handle), 0);
-  EXPECT_EQ(ReadText(handle, kvPropSession_DatabaseName), "");
-  EXPECT_EQ(ReadText(handle, kvPropSession_ClusterName), "");
-  EXPECT_EQ(ReadU32(handle, kvPropSession_NumInList), 0u);
 }
 
 }  // namespace

@@ -2,14 +2,12 @@
 // stale handle from a live one, and a handle that names no open session is refused by every call.
 // Error sessions stand for a failed open: every use answers with the failure, and clearing them
 // ends them quietly.
-#include <algorithm>
 #include <iterator>
 #include <map>
 #include <random>
 #include <set>
 #include <vector>
 
-#include "control_calls.h"
 #include "kvor_test_support.h"
 
 namespace {
@@ -17,37 +15,31 @@ namespace {
 using KvorSessionHandles = KvorTest;
 
 constexpr uint32_t kMaxSessions = 8192;
+constexpr int32_t kOpenFailure = static_cast<int32_t>(0xBFF6308A);
 
 uint32_t LowBits(uint32_t handle) { return handle & 0xFFFFu; }
 
-// The form every session handle must have: an index the library can use, and a top byte that
-// the library does not take for a system object (0x01), a database object (bit 7) or "no class"
-// (0x0F).
-void ExpectSessionForm(uint32_t handle) {
-  EXPECT_GE(LowBits(handle), 1u) << std::hex << handle;
-  EXPECT_LE(LowBits(handle), kMaxSessions) << std::hex << handle;
-  const uint32_t top = handle >> 24;
-  EXPECT_TRUE(top != 0x01u && top != 0x0Fu && (top & 0x80u) == 0) << std::hex << handle;
-}
-
 TEST_F(KvorSessionHandles, LowBitsStayUniqueAmongOpenSessionsThroughCreatesAndClears) {
-  const char *names[std::size(kInterfaceNames) + 1] = {"ENET1/monitor"};
-  std::copy(std::begin(kInterfaceNames), std::end(kInterfaceNames), names + 1);
   std::mt19937 random(20240917);
   std::map<uint32_t, uint32_t> openByLowBits;
   std::set<uint32_t> everHanded;
   for (int step = 0; step < 20000; ++step) {
     if (openByLowBits.empty() || random() % 3 != 0) {
       uint32_t handle = 0;
+      const char *name = step % 10 == 0 ? "ENET1/monitor" : kInterfaceNames[step % 9];
       const int32_t status = step % 5 == 0 ? kvhdnCreateErrorSession(kvsimErrInternal, &handle)
-                                           : kvCreateSession("", "", "A", names[step % 10],
+                                           : kvCreateSession("", "", "A", name,
                                                              kvMode_SignalInSinglePoint, &handle);
       ASSERT_EQ(status, 0) << "step " << step;
-      ExpectSessionForm(handle);
+      // An index the library can use, and a top byte it does not take for a system object
+      // (0x01), a database object (bit 7) or "no class" (0x0F).
+      const uint32_t top = handle >> 24;
+      ASSERT_TRUE(LowBits(handle) >= 1 && LowBits(handle) <= kMaxSessions && top != 0x01u &&
+                  top != 0x0Fu && (top & 0x80u) == 0)
+          << std::hex << handle;
       ASSERT_TRUE(openByLowBits.emplace(LowBits(handle), handle).second)
           << "low bits of " << std::hex << handle << " already in use at step " << std::dec << step;
-      ASSERT_TRUE(everHanded.insert(handle).second)
-          << "handle " << std::hex << handle << " handed out twice";
+      ASSERT_TRUE(everHanded.insert(handle).second) << std::hex << handle << " handed out twice";
     } else {
       auto victim = openByLowBits.begin();
       std::advance(victim, random() % openByLowBits.size());
@@ -78,67 +70,51 @@ TEST_F(KvorSessionHandles, AFullTableRefusesTheNextSessionUntilOneIsCleared) {
   EXPECT_EQ(LowBits(reused), LowBits(freed)) << "the only free index is the freed one";
   EXPECT_NE(reused, freed) << "the high bits must tell the new session from the cleared one";
   EXPECT_EQ(kvGetProperty(freed, kvPropSession_Mode, 4, &refused), kvsimErrInvalidSession);
-  EXPECT_EQ(ReadU32(reused, kvPropSession_Mode), static_cast<uint32_t>(kvMode_FrameInQueued));
 }
 
-TEST_F(KvorSessionHandles, EveryCallRefusesAHandleThatNamesNoOpenSession) {
+// Handles that name no open session get each call's refusal; error sessions get their failure.
+TEST_F(KvorSessionHandles, EveryCallAnswersAHandleThatIsNoWorkingSessionAndTouchesNothing) {
   const uint32_t cleared = Create("CAN1", kvMode_SignalInSinglePoint, "A");
   ASSERT_EQ(kvClear(cleared), 0);
   const uint32_t live = Create("CAN1", kvMode_SignalInSinglePoint, "A");
+  struct {
+    uint32_t handle;
+    int32_t failure;  // 0: no session at all
+  } cases[] = {{0u, 0}, {cleared, 0}, {live + 1, 0}, {live ^ 0x00010000u, 0}, {0x0F000001u, 0},
+               {0x80000001u, 0}, {0x20FF1FFFu, 0}, {0, kOpenFailure},
+               {0, kvsimErrUnknownInterface}, {0, -1}};
+  // All made before any is used: each must keep its own failure.
+  for (auto &c : cases) {
+    if (c.failure != 0) {
+      ASSERT_EQ(kvhdnCreateErrorSession(c.failure, &c.handle), 0);
+    }
+  }
   UseOutputs outputs;
   const std::vector<HandleUse> uses = HandleUses(outputs);
-  for (uint32_t handle :
-       {0u, cleared, live + 1, live ^ 0x00010000u, 0x0F000001u, 0x80000001u, 0x20FF1FFFu}) {
-    SCOPED_TRACE(testing::Message() << std::hex << handle);
+  for (const auto &c : cases) {
+    SCOPED_TRACE(testing::Message() << std::hex << c.handle << " failure " << c.failure);
     for (const HandleUse &use : uses) {
       outputs = UseOutputs();
-      EXPECT_EQ(use.run(handle), use.notOpenStatus) << use.call;
+      EXPECT_EQ(use.run(c.handle), c.failure != 0 ? c.failure : use.notOpenStatus) << use.call;
       EXPECT_TRUE(outputs.Untouched()) << use.call;
     }
-    EXPECT_EQ(kvClear(handle), kvsimErrInvalidSession);
-    EXPECT_EQ(kvsimSessionStarted(handle), -1);
+    // The controls do not take either for a session.
+    double value = 1.0;
+    EXPECT_EQ(kvsimSetSignalValues(c.handle, &value, 1), -1);
+    EXPECT_EQ(kvsimGetSignalValues(c.handle, &value, 1), -1);
+    EXPECT_EQ(kvsimRaiseCondition(c.handle, kvsimConditionIntfCommunicating, 1), -1);
+    EXPECT_EQ(kvsimSessionStarted(c.handle), -1);
+    if (c.failure == 0) {
+      EXPECT_EQ(kvClear(c.handle), kvsimErrInvalidSession);
+    }
   }
-  EXPECT_EQ(kvsimOpenSessionCount(), 1);
+  EXPECT_EQ(kvsimOpenSessionCount(), 4) << "the live session and three error sessions";
   EXPECT_EQ(kvsimSessionStarted(live), 0);
+  EXPECT_EQ(ReadText(live, kvPropSession_IntfName), "CAN1");
+  EXPECT_EQ(kvSystemClose(live), kvsimErrInvalidObject) << "a real session is not a system";
 }
 
-using KvorErrorSessions = KvorTest;
-
-constexpr int32_t kOpenFailure = static_cast<int32_t>(0xBFF6308A);
-
-TEST_F(KvorErrorSessions, EveryUseAnswersWithItsStatusAndTouchesNothing) {
-  const uint32_t session = Create("CAN1", kvMode_SignalInSinglePoint, "A");
-  UseOutputs outputs;
-  const std::vector<HandleUse> uses = HandleUses(outputs);
-  const int32_t failures[] = {kOpenFailure, kvsimErrUnknownInterface, -1};
-  uint32_t handles[3] = {};
-  for (int i = 0; i < 3; ++i) {
-    const int32_t failure = failures[i];
-    SCOPED_TRACE(testing::Message() << std::hex << failure);
-    uint32_t &handle = handles[i];
-    ASSERT_EQ(kvhdnCreateErrorSession(failure, &handle), 0);
-    for (const HandleUse &use : uses) {
-      outputs = UseOutputs();
-      EXPECT_EQ(use.run(handle), failure) << use.call;
-      EXPECT_TRUE(outputs.Untouched()) << use.call;
-    }
-    // The controls do not take it for a session.
-    double values[1] = {1.0};
-    EXPECT_EQ(kvsimSetSignalValues(handle, values, 1), -1);
-    EXPECT_EQ(kvsimGetSignalValues(handle, values, 1), -1);
-    EXPECT_EQ(kvsimRaiseCondition(handle, kvsimConditionIntfCommunicating, 1), -1);
-  }
-  uint32_t size = 0;
-  for (int i = 0; i < 3; ++i) {
-    EXPECT_EQ(kvGetPropertySize(handles[i], kvPropSession_IntfName, &size), failures[i])
-        << "each keeps its own failure";
-  }
-  EXPECT_EQ(ReadText(session, kvPropSession_IntfName), "CAN1") << "sessions live beside them";
-  EXPECT_EQ(kvSystemClose(session), kvsimErrInvalidObject) << "a real session is not a system";
-  EXPECT_EQ(kvsimOpenSessionCount(), 4);
-}
-
-TEST_F(KvorErrorSessions, ClearOrSystemCloseEndsItWithSuccess) {
+TEST_F(KvorSessionHandles, AnErrorSessionKeepsOnlyAnErrorAndEndsByClearOrSystemClose) {
   const struct {
     const char *call;
     int32_t (*end)(uint32_t);
@@ -149,16 +125,12 @@ TEST_F(KvorErrorSessions, ClearOrSystemCloseEndsItWithSuccess) {
     SCOPED_TRACE(end.call);
     uint32_t handle = 0;
     ASSERT_EQ(kvhdnCreateErrorSession(kOpenFailure, &handle), 0);
-    ASSERT_EQ(kvsimOpenSessionCount(), 1);
     EXPECT_EQ(end.end(handle), 0);
     EXPECT_EQ(kvsimOpenSessionCount(), 0);
     uint32_t size = 0;
     EXPECT_EQ(kvGetPropertySize(handle, kvPropSession_IntfName, &size), kvsimErrInvalidSession);
     EXPECT_EQ(end.end(handle), end.again) << "a second time";
   }
-}
-
-TEST_F(KvorErrorSessions, OnlyAnErrorCanBeKept) {
   uint32_t handle = 0x77;
   EXPECT_EQ(kvhdnCreateErrorSession(0, &handle), kvsimErrInvalidArgument);
   EXPECT_EQ(kvhdnCreateErrorSession(0x3FF60001, &handle), kvsimErrInvalidArgument);

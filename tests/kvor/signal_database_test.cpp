@@ -5,7 +5,7 @@
 #include <iterator>
 #include <vector>
 
-#include "frame_test_support.h"
+#include "kvor_test_support.h"
 #include "signal_test_support.h"
 
 namespace {
@@ -228,18 +228,6 @@ TEST_F(KvorSignalDatabase, QueueSizeBoundsThePairsOfEachSignal) {
   const uint32_t count = 3;
   ASSERT_EQ(kvWriteSignalXY(writer, 0.0, values, 24, times, 24, &count, 4), 0);
   EXPECT_EQ(ReadPairs(reader, 1, 8).values[0], (std::vector<double>{1, 2}));  // the third dropped
-}
-
-TEST_F(KvorSignalDatabase, AFillHandsOutMadeUpValuesUntilItEnds) {
-  const uint32_t xy = Create("CAN1", kvMode_SignalInXY, "A,B");
-  EXPECT_EQ(kvsimSetSignalReadFill(Create("CAN1", kvMode_SignalOutXY, "A"), 1), -1);
-  ASSERT_EQ(kvsimSetSignalReadFill(xy, 2), 0);
-  kvsimSetClock(500);
-  const tPairs pairs = ReadPairs(xy, 2, 3);
-  EXPECT_EQ(pairs.values[1], (std::vector<double>{1000, 1001}));  // two of a run of three
-  EXPECT_EQ(pairs.times[1], (std::vector<uint64_t>{500, 501}));
-  ASSERT_EQ(kvsimSetSignalReadFill(xy, -1), 0);
-  EXPECT_TRUE(ReadPairs(xy, 2, 3).values[0].empty());
 }
 
 TEST_F(KvorSignalDatabase, CallsCheckModesRegionsAndArguments) {

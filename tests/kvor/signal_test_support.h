@@ -52,12 +52,6 @@ inline std::string ListOf(const std::vector<tSignalCase> &signals) {
   return list;
 }
 
-inline std::vector<double> ValuesOf(const std::vector<tSignalCase> &signals) {
-  std::vector<double> values;
-  for (const tSignalCase &signal : signals) values.push_back(signal.value);
-  return values;
-}
-
 inline void SetResampleRate(uint32_t session, double rate) {
   ASSERT_EQ(kvSetProperty(session, kvPropSession_ResampRate, sizeof rate, &rate), 0);
 }

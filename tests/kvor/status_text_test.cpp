@@ -38,6 +38,11 @@ TEST_F(KvorStatusText, EveryStatusOfTheDriverHasATextOfItsOwn) {
     EXPECT_EQ(text.find("Unknown"), std::string::npos) << std::hex << status << ": " << text;
     EXPECT_TRUE(texts.insert(text).second) << "shared text: " << text;
   }
+  for (int32_t status = kvsimErrDatabaseNotFound; status <= kvsimErrSignalLayout; ++status) {
+    const std::string text = TextOf(status);
+    EXPECT_EQ(text.find("Unknown"), std::string::npos) << std::hex << status << ": " << text;
+    EXPECT_TRUE(texts.insert(text).second) << "shared text: " << text;
+  }
 }
 
 TEST_F(KvorStatusText, TheBindingsStatusesHaveTextsAndAnyOtherIsNamedByItsNumber) {
