@@ -1,5 +1,4 @@
-// The run-mode flags answer what was set, and a reset puts every control back to its default
-// while it leaves live host data alone.
+// A reset puts every control back to its default while it leaves live host data alone.
 #include <gtest/gtest.h>
 
 #include "host_fixture.h"
@@ -7,18 +6,6 @@
 namespace {
 
 using Reset = HostTest;
-
-TEST_F(Reset, RunModeFlagsAnswerWhatWasSet) {
-  const struct {
-    int32_t bound, runTime, fullFeature;
-  } modes[] = {{1, 0, 0}, {0, 1, 0}, {0, 0, 1}, {1, 1, 1}, {0, 0, 0}};
-  for (const auto &m : modes) {
-    svsimSetRunMode(m.bound, m.runTime, m.fullFeature);
-    EXPECT_EQ(svIsBoundApp(0), m.bound);
-    EXPECT_EQ(svIsRunTime(0), m.runTime);
-    EXPECT_EQ(svIsFullFeatureRunTime(0), m.fullFeature);
-  }
-}
 
 int gRuns = 0;
 int32_t CountRun(uint64_t) { return ++gRuns; }
