@@ -8,6 +8,9 @@
 #include <set>
 #include <string>
 
+#include "property/annotate_property_status.h"
+#include "svsim.h"
+
 namespace {
 
 using namespace nKVSVAPI100;
@@ -110,6 +113,86 @@ TEST(PropertyIdToName, NamesExactly382DistinctIdentifiersUnderTheirClassPrefix) 
   }
   EXPECT_EQ(found, 382);
   EXPECT_EQ(names.size(), 382u);
+}
+
+class AnnotatePropertyStatusTest : public testing::Test {
+ protected:
+  void SetUp() override { liveBefore_ = svsimReset(); }
+  void TearDown() override {
+    svsimReset();
+    EXPECT_EQ(svsimLiveHandles(), liveBefore_) << "handles left alive";
+  }
+
+  static std::string Text(SvHandle string) {
+    char text[128] = {};
+    const int32_t length = svsimReadString(string, text, sizeof text);
+    return std::string(text, static_cast<size_t>(length));
+  }
+
+  uint64_t liveBefore_ = 0;
+};
+
+TEST_F(AnnotatePropertyStatusTest, WritesTheNameBehindItsFirstUnderscoreIntoANewHandle) {
+  struct tCase {
+    Status status;
+    uint32_t id;
+    const char *text;
+  };
+  const tCase cases[] = {
+      {static_cast<Status>(0xBFF630B0), 0x04100003, "\nProperty: List"},
+      {0x3FF60001, 0x04100003, "\nProperty: List"},
+      {-1, 0x0802FFFC, "\nProperty: PDU_Mapping"},
+      {-1, 0x03100086, "\nProperty: J1939_AddrFilter"},
+      {-1, 0x0A070009, "\nProperty: NC_FF_DataBytes"},
+      {-1, 0x0002FEFD, "\nProperty: (unknown ID hex 0002fefd)"},
+      {7, 0x0C0FABCD, "\nProperty: (unknown ID hex 0c0fabcd)"},
+      {-1, 0x00000000, "\nProperty: (unknown ID hex 00000000)"},
+  };
+  for (const tCase &c : cases) {
+    SvHandle earlier = svsimMakeString("earlier");
+    SvHandle info = earlier;
+    const uint64_t live = svsimLiveHandles();
+    svsimResetCounters();
+    AnnotatePropertyStatus(c.status, c.id, &info);
+    ASSERT_NE(info, nullptr) << std::hex << c.id;
+    EXPECT_NE(info, earlier);
+    EXPECT_EQ(Text(info), c.text) << std::hex << c.id;
+    // Every annotation fits the fixed width: the handle is never grown.
+    EXPECT_EQ(svGetHandleSize(info), 108u);
+    EXPECT_EQ(svsimAllocCount(), 1u);
+    EXPECT_EQ(svsimResizeCount(), 0u);
+    // The host still owns what it passed in: it stays alive and unchanged.
+    EXPECT_EQ(svsimFreeCount(), 0u);
+    EXPECT_EQ(svsimLiveHandles(), live + 1);
+    EXPECT_EQ(Text(earlier), "earlier");
+    svDisposeHandle(info);
+    svDisposeHandle(earlier);
+  }
+}
+
+TEST_F(AnnotatePropertyStatusTest, LeavesInfoAloneForSuccessOrNoInfo) {
+  SvHandle earlier = svsimMakeString("earlier");
+  SvHandle info = earlier;
+  svsimResetCounters();
+  AnnotatePropertyStatus(0, 0x04100003, &info);
+  AnnotatePropertyStatus(-1, 0x04100003, nullptr);
+  EXPECT_EQ(info, earlier);
+  EXPECT_EQ(Text(info), "earlier");
+  EXPECT_EQ(svsimAllocCount(), 0u);
+  svDisposeHandle(earlier);
+}
+
+TEST_F(AnnotatePropertyStatusTest, AFailedAllocationLeavesNullAndTheEarlierHandleAlive) {
+  SvHandle earlier = svsimMakeString("earlier");
+  SvHandle info = earlier;
+  const uint64_t live = svsimLiveHandles();
+  svsimFailAllocAt(1);
+  AnnotatePropertyStatus(-1, 0x04100003, &info);
+  EXPECT_EQ(svsimInjectedFaults(), 1u);
+  EXPECT_EQ(info, nullptr);
+  EXPECT_EQ(svsimLiveHandles(), live);
+  EXPECT_EQ(Text(earlier), "earlier");
+  svDisposeHandle(earlier);
 }
 
 }  // namespace
