@@ -2,6 +2,7 @@
 // stand in for them.
 #include <algorithm>
 #include <cmath>
+#include <iterator>
 
 #include "kvor_test_support.h"
 
@@ -123,7 +124,9 @@ TEST_F(KvorFrameQueue, AReadStreamIsCopiedVerbatimOnceOrOnEveryRead) {
   EXPECT_EQ(kvsimSetReadStream(Create("CAN1", kvMode_FrameOutStream), stream.data(), 1, 1), -1);
 }
 
-TEST_F(KvorFrameQueue, ReadsNeedAnInputSessionOfRecords) {
+using KvorFrameCalls = KvorTest;
+
+TEST_F(KvorFrameCalls, ReadsAndWritesNeedTheirModeProtocolAndArguments) {
   uint8_t buffer[24];
   uint32_t got = 0;
   for (uint32_t mode = 0; mode <= 12; ++mode) {
@@ -132,18 +135,34 @@ TEST_F(KvorFrameQueue, ReadsNeedAnInputSessionOfRecords) {
     EXPECT_EQ(kvReadFrame(session, buffer, 24, 0.0, &got), input ? 0 : kvsimErrWrongMode) << mode;
     EXPECT_EQ(kvhdnReadFrame(session, buffer, 24, 1, 0.0, &got), input ? 0 : kvsimErrWrongMode);
   }
-  const uint32_t enet = Create("ENET1", kvMode_FrameInStream);
-  EXPECT_EQ(kvReadFrame(enet, buffer, 24, 0.0, &got), kvsimErrWrongProtocol);
   const uint32_t can = Create("CAN1", kvMode_FrameInStream);
+  const uint32_t writer = Create("CAN3", kvMode_FrameOutSinglePoint);
+  const uint32_t reader = Create("CAN4", kvMode_FrameInStream);
+  const uint32_t enetIn = Create("ENET1", kvMode_FrameInStream);
+  const uint32_t enetOut = Create("ENET1", kvMode_FrameOutStream);
+  const std::vector<uint8_t> one = Pack({{5, {5}}}, true);
   EthernetSlot slot{};
   int32_t returned = 0;
-  EXPECT_EQ(kvhdnReadFrameEthernet(can, &slot, 1, &returned, 0.0), kvsimErrWrongProtocol);
-  EXPECT_EQ(kvhdnReadFrameEthernet(Create("ENET1", kvMode_FrameInSinglePoint, "0x1"), &slot, 1,
-                                   &returned, 0.0),
-            kvsimErrWrongMode);
-  EXPECT_EQ(kvReadFrame(can, buffer, 24, 0.0, nullptr), kvsimErrNullPointer);
-  EXPECT_EQ(kvReadFrame(can, nullptr, 24, 0.0, &got), kvsimErrNullPointer);
-  EXPECT_EQ(kvReadFrame(can, buffer, 24, std::nan(""), &got), kvsimErrInvalidArgument);
+  const int32_t cases[][2] = {
+      {kvReadFrame(enetIn, buffer, 24, 0.0, &got), kvsimErrWrongProtocol},
+      {kvhdnReadFrameEthernet(can, &slot, 1, &returned, 0.0), kvsimErrWrongProtocol},
+      {kvhdnReadFrameEthernet(Create("ENET1", kvMode_FrameInSinglePoint, "0x1"), &slot, 1,
+                              &returned, 0.0),
+       kvsimErrWrongMode},
+      {kvReadFrame(can, buffer, 24, 0.0, nullptr), kvsimErrNullPointer},
+      {kvReadFrame(can, nullptr, 24, 0.0, &got), kvsimErrNullPointer},
+      {kvReadFrame(can, buffer, 24, std::nan(""), &got), kvsimErrInvalidArgument},
+      {kvWriteFrame(writer, nullptr, 0, 0.0), 0},  // an empty write is valid
+      {kvWriteFrame(writer, nullptr, 24, 0.0), kvsimErrNullPointer},
+      {kvWriteFrame(writer, one.data(), 24, std::nan("")), kvsimErrInvalidArgument},
+      {kvWriteFrame(can, one.data(), 24, 0.0), kvsimErrWrongMode},
+      {kvWriteFrame(enetOut, one.data(), 24, 0.0), kvsimErrWrongProtocol},
+      {kvhdnWriteFrameEthernet(writer, nullptr, 0, 0.0), kvsimErrWrongProtocol},
+      {kvhdnWriteFrameEthernet(enetIn, nullptr, 0, 0.0), kvsimErrWrongMode},
+      {kvWriteFrame(writer, one.data(), 24, 2.5), 0},  // a time limit is accepted
+  };
+  for (size_t i = 0; i < std::size(cases); ++i) EXPECT_EQ(cases[i][0], cases[i][1]) << i;
+  EXPECT_EQ(ReadU32(reader, kvPropSession_NumPend), 1u) << "only the write with a time limit";
   ASSERT_EQ(kvClear(can), 0);
   EXPECT_EQ(kvReadFrame(can, buffer, 24, 0.0, &got), kvsimErrInvalidSession);
 }

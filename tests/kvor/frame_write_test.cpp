@@ -98,23 +98,6 @@ TEST_F(KvorFrameWrite, ASinkKeepsEveryWriteUncheckedAndSendsNothing) {
   EXPECT_EQ(kvsimSetWriteSink(reader, 1), -1);
 }
 
-TEST_F(KvorFrameWrite, WritesNeedAnOutputSessionAndABufferForTheirSize) {
-  const uint32_t writer = Create("CAN3", kvMode_FrameOutSinglePoint);
-  const uint32_t reader = Create("CAN4", kvMode_FrameInStream);
-  EXPECT_EQ(kvWriteFrame(writer, nullptr, 0, 0.0), 0) << "an empty write is valid";
-  EXPECT_EQ(kvWriteFrame(writer, nullptr, 24, 0.0), kvsimErrNullPointer);
-  const std::vector<uint8_t> one = Pack({{5, {5}}}, true);
-  EXPECT_EQ(kvWriteFrame(writer, one.data(), 24, std::nan("")), kvsimErrInvalidArgument);
-  EXPECT_EQ(kvWriteFrame(writer, one.data(), 24, 2.5), 0) << "a time limit is accepted";
-  EXPECT_EQ(ReadU32(reader, kvPropSession_NumPend), 1u);
-  EXPECT_EQ(kvWriteFrame(reader, one.data(), 24, 0.0), kvsimErrWrongMode);
-  const uint32_t enet = Create("ENET1", kvMode_FrameOutStream);
-  EXPECT_EQ(kvWriteFrame(enet, one.data(), 24, 0.0), kvsimErrWrongProtocol);
-  EXPECT_EQ(kvhdnWriteFrameEthernet(writer, nullptr, 0, 0.0), kvsimErrWrongProtocol);
-  EXPECT_EQ(kvhdnWriteFrameEthernet(Create("ENET1", kvMode_FrameInStream), nullptr, 0, 0.0),
-            kvsimErrWrongMode);
-}
-
 TEST_F(KvorFrameWrite, AnEthernetWriteIsRefusedWholeForAnyBadDescriptor) {
   const uint32_t writer = Create("ENET1", kvMode_FrameOutQueued);
   const uint32_t reader = Create("ENET1", kvMode_FrameInQueued);
