@@ -37,7 +37,8 @@
  *                     0x00 and 0x05 take exactly 4 bytes, 0x01 and 0x09 exactly 8, 0x02 exactly
  *                     1; text types (0x03, 0x04) get a NUL if set without one, and their size
  *                     counts it. Sub-properties are kept per list item: the index must be below
- *                     NumInList. A read whose buffer is smaller than the value is refused whole.
+ *                     NumInList. A read whose buffer is smaller than the value is refused whole,
+ *                     except a 1-byte read of a type 0x00 value, which gets its low byte.
  *   System objects    Read-only: kvPropSys_Ver* (4 bytes), DevRefs, IntfRefs, IntfRefsAll,
  *                     IntfRefsCAN/FlexRay/LIN/Ethernet (arrays of 4-byte handles);
  *                     kvPropDev_Name, SerNum, ProductNum, NumPorts, NumPortsAll, IntfRefs,

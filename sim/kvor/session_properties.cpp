@@ -77,6 +77,10 @@ Status GetSessionPropertySize(const Session &session, uint32_t id, uint32_t *siz
 Status GetSessionProperty(const Session &session, uint32_t id, uint32_t size, void *value) {
   const std::optional<PropertyValue> stored = PropertyOf(session, id);
   if (!stored) return kvsimErrPropertyUnknown;
+  // Byte settings are kept in 32-bit words: a 1-byte read of one gets its low byte.
+  if (size == 1 && (id >> 24) == 0 && stored->size() == sizeof(uint32_t)) {
+    return CopyValueOut(PropertyValue(stored->begin(), stored->begin() + 1), size, value);
+  }
   return CopyValueOut(*stored, size, value);
 }
 
