@@ -541,6 +541,130 @@ KVSV_EXPORT kvsvStatus kvsvReadSignalXYEx(uint32_t session, int32_t numSamples,
  * signal count read included. */
 KVSV_EXPORT kvsvStatus kvsvWriteSignalXY(uint32_t session, SvHandle clusters, double timeout);
 
+/* ---- Session properties --------------------------------------------------------------------
+ * Properties of a session, system, device or interface, one pair of functions per shape of the
+ * value. Arguments: `session` the handle; `subId` (Ex forms only) a host string handle, or null,
+ * naming the entry of the session's list that a sub-indexed property is written for: a decimal
+ * index, or a name of the list (a name before its first '.', blanks and anything behind a
+ * blank or line feed ignored), null or empty meaning entry 0; only sub-indexed writes read it;
+ * `id` the property identifier; `value` the destination of a read or the source of a write, or
+ * for arrays and strings a pointer to the host handle, which reads create or resize; `info` a
+ * host string handle pointer, or null: on any status but 0, warnings included, a new handle
+ * naming the property is stored there (what it held before stays the caller's to dispose).
+ * The plain forms are the Ex forms with a null `subId`.
+ * A system-class property given the handle of the first system ever opened goes to the system
+ * open now, so that a reference kept from before a close and reopen still works.
+ * Statuses: the driver's, or 0xBFF63010 out of memory, 0xBFF63015 a null `value` where the
+ * library itself reads or writes through it, and, for sub-indexed writes, 0xBFF6317F an index
+ * that is not a number (up to 2^31 - 1), 0xBFF63180 a name that is not in the list, 0xBFF63020
+ * no such session and 0xBFF63027 a session busy looking up a name or closing. */
+
+/* Single values: U8 (1 byte; a write sends 4 bytes from `value`; the J1939 address and fill
+ * byte go through a 32-bit word both ways), U32, U64, F64, Bool (1 byte). Sub-indexed writes:
+ * the U32 per-frame skip, queue update and corrupted-checksum counts and the hidden frame
+ * setting, the F64 start time offset and transmit time. Writing the hidden U32 switch
+ * 0x0011FFF1 turns the report of implicit closes on or off and reaches no driver. */
+KVSV_EXPORT kvsvStatus kvsvSessionGetPropExU8(uint32_t session, SvHandle *subId, uint32_t id,
+                                              uint8_t *value, SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionGetPropU8(uint32_t session, uint32_t id, uint8_t *value,
+                                            SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionSetPropExU8(uint32_t session, SvHandle *subId, uint32_t id,
+                                              const uint8_t *value, SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionSetPropU8(uint32_t session, uint32_t id, const uint8_t *value,
+                                            SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionGetPropExU32(uint32_t session, SvHandle *subId, uint32_t id,
+                                               uint32_t *value, SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionGetPropU32(uint32_t session, uint32_t id, uint32_t *value,
+                                             SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionSetPropExU32(uint32_t session, SvHandle *subId, uint32_t id,
+                                               const uint32_t *value, SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionSetPropU32(uint32_t session, uint32_t id,
+                                             const uint32_t *value, SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionGetPropExU64(uint32_t session, SvHandle *subId, uint32_t id,
+                                               uint64_t *value, SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionGetPropU64(uint32_t session, uint32_t id, uint64_t *value,
+                                             SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionSetPropExU64(uint32_t session, SvHandle *subId, uint32_t id,
+                                               const uint64_t *value, SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionSetPropU64(uint32_t session, uint32_t id,
+                                             const uint64_t *value, SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionGetPropExF64(uint32_t session, SvHandle *subId, uint32_t id,
+                                               double *value, SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionGetPropF64(uint32_t session, uint32_t id, double *value,
+                                             SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionSetPropExF64(uint32_t session, SvHandle *subId, uint32_t id,
+                                               const double *value, SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionSetPropF64(uint32_t session, uint32_t id, const double *value,
+                                             SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionGetPropExBool(uint32_t session, SvHandle *subId, uint32_t id,
+                                                uint8_t *value, SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionGetPropBool(uint32_t session, uint32_t id, uint8_t *value,
+                                              SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionSetPropExBool(uint32_t session, SvHandle *subId, uint32_t id,
+                                                const uint8_t *value, SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionSetPropBool(uint32_t session, uint32_t id,
+                                              const uint8_t *value, SvHandle *info);
+
+/* Times: the driver's 8-byte time, converted to SvTime whatever the read returned (0 stays the
+ * zero time). There is no time setter: the Set forms report an internal error, 0xBFF63001. */
+KVSV_EXPORT kvsvStatus kvsvSessionGetPropExTime(uint32_t session, SvHandle *subId, uint32_t id,
+                                                SvTime *value, SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionGetPropTime(uint32_t session, uint32_t id, SvTime *value,
+                                              SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionSetPropExTime(uint32_t session, SvHandle *subId, uint32_t id,
+                                                const SvTime *value, SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionSetPropTime(uint32_t session, uint32_t id, const SvTime *value,
+                                              SvHandle *info);
+
+/* Number arrays (count at byte 0, elements from byte 4). A read sizes the array to what the
+ * driver has and stores that count even if the read itself fails; a failed size query leaves the
+ * array as it was. A write sends the elements in place; a null or empty array is sent as empty.
+ * Sub-indexed writes: the custom code data. U8_1D and U16_1D have Ex forms only. */
+KVSV_EXPORT kvsvStatus kvsvSessionGetPropExU8_1D(uint32_t session, SvHandle *subId, uint32_t id,
+                                                 SvHandle *value, SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionSetPropExU8_1D(uint32_t session, SvHandle *subId, uint32_t id,
+                                                 SvHandle *value, SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionGetPropExU16_1D(uint32_t session, SvHandle *subId, uint32_t id,
+                                                  SvHandle *value, SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionSetPropExU16_1D(uint32_t session, SvHandle *subId, uint32_t id,
+                                                  SvHandle *value, SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionGetPropExU32_1D(uint32_t session, SvHandle *subId, uint32_t id,
+                                                  SvHandle *value, SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionGetPropU32_1D(uint32_t session, uint32_t id, SvHandle *value,
+                                                SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionSetPropExU32_1D(uint32_t session, SvHandle *subId, uint32_t id,
+                                                  SvHandle *value, SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionSetPropU32_1D(uint32_t session, uint32_t id, SvHandle *value,
+                                                SvHandle *info);
+
+/* Text. The cluster name reads as "database.cluster". A write sends a NUL-terminated copy; a
+ * null or empty string is sent as a single NUL. Sub-indexed writes: the J1939 address filter. */
+KVSV_EXPORT kvsvStatus kvsvSessionGetPropExString(uint32_t session, SvHandle *subId, uint32_t id,
+                                                  SvHandle *value, SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionGetPropString(uint32_t session, uint32_t id, SvHandle *value,
+                                                SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionSetPropExString(uint32_t session, SvHandle *subId, uint32_t id,
+                                                  SvHandle *value, SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionSetPropString(uint32_t session, uint32_t id, SvHandle *value,
+                                                SvHandle *info);
+
+/* Arrays of strings, cut from the driver's comma list; `*value` is replaced by a new array. The
+ * session's list is answered in modes 0 to 5 only, the LIN schedule names in any mode, and the
+ * hidden frame list 0x0410FFFF (the list of a session of mode 7, 8, 10 or 11) in those modes
+ * only; in other modes these return the status of the mode's read and leave `*value` as it was.
+ * Their entries read "entry\ndatabase.cluster", each a reference to its object. There is no
+ * setter: the Set forms report an internal error, 0xBFF63001. */
+KVSV_EXPORT kvsvStatus kvsvSessionGetPropExString1D(uint32_t session, SvHandle *subId,
+                                                    uint32_t id, SvHandle *value,
+                                                    SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionGetPropString1D(uint32_t session, uint32_t id, SvHandle *value,
+                                                  SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionSetPropExString1D(uint32_t session, SvHandle *subId,
+                                                    uint32_t id, SvHandle *value,
+                                                    SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionSetPropString1D(uint32_t session, uint32_t id, SvHandle *value,
+                                                  SvHandle *info);
+
 #ifdef __cplusplus
 }
 #endif
