@@ -1,5 +1,6 @@
-// Frames travel from output sessions to the input sessions of the same network, with the clock's
-// time, as echoes on the writer's own interface, and in the record form of the reading session.
+// Frames travel from output sessions to the input sessions of the same network only, with the
+// clock's time, and as echoes on the writer's own interface when asked for; single-point sessions
+// keep the latest frame of each item; frame sessions have their defaults before any is set.
 #include <string>
 
 #include "kvor_test_support.h"
@@ -57,100 +58,6 @@ TEST_F(KvorFrameDelivery, AnEchoReachesTheWritersOwnInterfaceMarked) {
   EXPECT_EQ(Drain(own), (std::vector<Rec>{{0x100, {7}, 0, 0x80, 0, kNoon + 5}}));
   EXPECT_EQ(Drain(far), (std::vector<Rec>{{0x100, {7}, 0, 0x00, 0, kNoon + 5}}))
       << "a written echo flag does not travel";
-}
-
-TEST_F(KvorFrameDelivery, Enet1HearsItselfThroughDescriptors) {
-  const uint32_t writer = Create("ENET1", kvMode_FrameOutStream);
-  const uint32_t first = Create("ENET1/a", kvMode_FrameInStream);
-  const uint32_t second = Create("ENET1/b", kvMode_FrameInQueued);
-  const std::vector<uint8_t> jumbo = Pattern(1500, 3);
-  const uint8_t tiny[] = {0xAB};
-  const EthernetOut frames[] = {Out(jumbo.data(), 1500), Out(nullptr, 0), Out(tiny, 1)};
-  kvsimSetClock(116444736000000000ull + 42);  // 1970 plus 4200 ns
-  ASSERT_EQ(kvhdnWriteFrameEthernet(writer, frames, 2, 0.0), 0);
-  SetEcho(writer);
-  kvsimAdvanceClock(10);
-  ASSERT_EQ(kvhdnWriteFrameEthernet(writer, frames + 2, 1, 0.0), 0);
-
-  for (uint32_t reader : {first, second}) {
-    std::vector<uint8_t> room(3 * 2000, 0xEE);
-    EthernetSlot slots[4] = {Room(room.data(), 1500), Room(room.data() + 2000, 64),
-                             Room(room.data() + 4000, 0),  // no room: cut to nothing
-                             Room(room.data() + 4000, 64)};
-    int32_t returned = -1;
-    ASSERT_EQ(kvhdnReadFrameEthernet(reader, slots, 4, &returned, 0.0), 0);
-    ASSERT_EQ(returned, 3);
-    EXPECT_EQ(std::vector<uint8_t>(room.begin(), room.begin() + 1500), jumbo);
-    struct Expected {
-      uint32_t length, flags, wireLength, word;
-      uint64_t time;
-    };
-    const Expected expected[] = {{1500, 0x0, 1500, 1, 4200}, {0, 0x0, 0, 2, 4200},
-                                 {0, 0x9, 1, 3, 5200}};
-    for (int i = 0; i < 3; ++i) {
-      SCOPED_TRACE(i);
-      EXPECT_EQ(slots[i].length, expected[i].length);
-      EXPECT_EQ(slots[i].flags, expected[i].flags) << "bit 0 echo, bit 3 cut";
-      EXPECT_EQ(slots[i].wireLength, expected[i].wireLength);
-      EXPECT_EQ(slots[i].word, expected[i].word) << "numbered on the network";
-      EXPECT_EQ(slots[i].firstTime, expected[i].time) << "1 ns since 1970";
-      EXPECT_EQ(slots[i].secondTime, expected[i].time);
-    }
-    EXPECT_EQ(room[4000], 0xEE) << "nothing stored without room";
-  }
-}
-
-TEST_F(KvorFrameDelivery, TheReadersFormDecidesTheRecordSizes) {
-  struct Case {
-    const char *name;
-    const char *from;
-    const char *to;
-    uint32_t canIoMode;
-    uint32_t application;
-    bool fixed;
-    std::vector<uint32_t> lengths;
-    std::vector<uint32_t> sizes;  // of each record that kvReadFrame gives
-  };
-  const Case cases[] = {
-      {"classic CAN", "CAN1", "CAN2", 0, 0, true, {0, 3, 8}, {24, 24, 24}},
-      {"LIN", "LIN2", "LIN1", 0, 0, true, {8, 1}, {24, 24}},
-      {"CAN FD", "CAN3", "CAN4", 1, 0, false, {12, 16, 20, 24, 32, 48, 64, 0},
-       {32, 32, 40, 40, 48, 64, 80, 24}},
-      {"J1939", "CAN2", "CAN1", 0, 1, false, {1785, 256, 255, 8}, {1808, 272, 272, 24}},
-      {"FlexRay", "FlexRay1", "FlexRay2", 0, 0, false, {254, 17, 0}, {272, 40, 24}},
-  };
-  for (const Case &c : cases) {
-    SCOPED_TRACE(c.name);
-    kvsimReset();
-    const uint32_t writer = Create(c.from, kvMode_FrameOutQueued);
-    const uint32_t reader = Create(c.to, kvMode_FrameInQueued);
-    std::vector<Rec> sent;
-    for (uint32_t length : c.lengths) {
-      Rec r{0x600u + length, Pattern(length, static_cast<uint8_t>(length))};
-      if (length > 255) r.type = 0xC0;  // the high bits of the length go into Info, beside 0x18
-      if (length > 255) r.info = 0x18;
-      sent.push_back(r);
-    }
-    for (uint32_t session : {writer, reader}) {
-      SetU32(session, kvPropSession_IntfCanIoMode, c.canIoMode);
-      SetU32(session, kvPropSession_ApplicationProtocol, c.application);
-    }
-    const std::vector<uint8_t> bytes = Pack(sent, c.fixed);
-    ASSERT_EQ(kvWriteFrame(writer, bytes.data(), static_cast<uint32_t>(bytes.size()), 0.0), 0);
-    std::vector<uint8_t> buffer(8192);
-    uint32_t got = 0;
-    ASSERT_EQ(kvReadFrame(reader, buffer.data(), 8192, 0.0, &got), 0);
-    uint32_t total = 0;
-    for (uint32_t size : c.sizes) total += size;
-    EXPECT_EQ(got, total);
-    const std::vector<Rec> read = Unpack(buffer.data(), got, c.fixed);
-    ASSERT_EQ(read.size(), sent.size());
-    for (size_t i = 0; i < sent.size(); ++i) {
-      EXPECT_EQ(read[i].payload, sent[i].payload) << i;
-      EXPECT_EQ(read[i].type, sent[i].type) << i;
-      EXPECT_EQ(read[i].info & 0xF8, sent[i].info) << i;
-    }
-  }
 }
 
 TEST_F(KvorFrameDelivery, ASinglePointSessionGivesTheLatestFrameOfEachItem) {
