@@ -4,11 +4,10 @@
 #ifndef KVSVAPI_PROPERTY_PROPERTY_VALUE_IO_H
 #define KVSVAPI_PROPERTY_PROPERTY_VALUE_IO_H
 
+#include <boost/noncopyable.hpp>
 #include <cstdint>
 #include <cstdlib>
 #include <cstring>
-
-#include <boost/noncopyable.hpp>
 
 #include "core/host_handles.h"
 #include "core/status.h"

@@ -28,8 +28,8 @@ Status LookUpName(uint32_t session, const SvStr &name, int32_t *indexOut) {
   if (!guard) return guard.status();
   const Status status = EnsureNameList(session, guard.slot());
   if (status < 0) return status;
-  const int32_t index = guard.slot().sessionNameList->Find(
-      reinterpret_cast<const char *>(name.str), name.cnt);
+  const int32_t index =
+      guard.slot().sessionNameList->Find(reinterpret_cast<const char *>(name.str), name.cnt);
   *indexOut = index;
   return index < 0 ? kvErrSubIdNameUnknown : 0;
 }

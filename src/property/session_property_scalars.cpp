@@ -105,9 +105,8 @@ extern "C" KVSV_EXPORT kvsvStatus kvsvSessionSetPropU8(uint32_t session, uint32_
   return kvsvSessionSetPropExU8(session, nullptr, id, value, info);
 }
 
-extern "C" KVSV_EXPORT kvsvStatus kvsvSessionGetPropExU32(uint32_t session, SvHandle *,
-                                                          uint32_t id, uint32_t *value,
-                                                          SvHandle *info) {
+extern "C" KVSV_EXPORT kvsvStatus kvsvSessionGetPropExU32(uint32_t session, SvHandle *, uint32_t id,
+                                                          uint32_t *value, SvHandle *info) {
   return GetScalar(session, id, value, info);
 }
 extern "C" KVSV_EXPORT kvsvStatus kvsvSessionGetPropU32(uint32_t session, uint32_t id,
@@ -124,9 +123,8 @@ extern "C" KVSV_EXPORT kvsvStatus kvsvSessionSetPropU32(uint32_t session, uint32
   return kvsvSessionSetPropExU32(session, nullptr, id, value, info);
 }
 
-extern "C" KVSV_EXPORT kvsvStatus kvsvSessionGetPropExU64(uint32_t session, SvHandle *,
-                                                          uint32_t id, uint64_t *value,
-                                                          SvHandle *info) {
+extern "C" KVSV_EXPORT kvsvStatus kvsvSessionGetPropExU64(uint32_t session, SvHandle *, uint32_t id,
+                                                          uint64_t *value, SvHandle *info) {
   return GetScalar(session, id, value, info);
 }
 extern "C" KVSV_EXPORT kvsvStatus kvsvSessionGetPropU64(uint32_t session, uint32_t id,
@@ -143,9 +141,8 @@ extern "C" KVSV_EXPORT kvsvStatus kvsvSessionSetPropU64(uint32_t session, uint32
   return kvsvSessionSetPropExU64(session, nullptr, id, value, info);
 }
 
-extern "C" KVSV_EXPORT kvsvStatus kvsvSessionGetPropExF64(uint32_t session, SvHandle *,
-                                                          uint32_t id, double *value,
-                                                          SvHandle *info) {
+extern "C" KVSV_EXPORT kvsvStatus kvsvSessionGetPropExF64(uint32_t session, SvHandle *, uint32_t id,
+                                                          double *value, SvHandle *info) {
   return GetScalar(session, id, value, info);
 }
 extern "C" KVSV_EXPORT kvsvStatus kvsvSessionGetPropF64(uint32_t session, uint32_t id,

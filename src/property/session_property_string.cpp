@@ -48,13 +48,13 @@ Status ReadClusterName(uint32_t handle, SvHandle *value) {
 
 Status ReadString(uint32_t handle, uint32_t id, SvHandle *value) {
   if (id == kvPropSession_ClusterName) return ReadClusterName(handle, value);
-  return ReadSizedIntoHandle<tSessionPropertyCalls>(
-      handle, id, value, kStringSlack, [value](Status status, uint32_t size) {
-        if (status < 0) return;
-        // The handle has room behind the driver's bytes: a text without its NUL ends there.
-        TextOf(*value)[size] = '\0';
-        CountText(*value);
-      });
+  // The handle has room behind the driver's bytes: a text without its NUL ends there.
+  const auto countText = [value](Status status, uint32_t size) {
+    if (status < 0) return;
+    TextOf(*value)[size] = '\0';
+    CountText(*value);
+  };
+  return ReadSizedIntoHandle<tSessionPropertyCalls>(handle, id, value, kStringSlack, countText);
 }
 
 }  // namespace

@@ -1,9 +1,8 @@
 // kvsvSessionGetPropString1D and its Ex form: a comma list of the driver as a host array of
 // strings. The session's list comes in reference-string form, so that each entry names its
 // object in the session's database and cluster. There is no setter.
-#include <cstdint>
-
 #include <boost/noncopyable.hpp>
+#include <cstdint>
 
 #include "kvorproperties.h"
 #include "kvsvapi.h"
@@ -78,9 +77,8 @@ Status ReadStringArray(uint32_t handle, uint32_t &id, SvHandle *value, SvHandle 
 extern "C" KVSV_EXPORT kvsvStatus kvsvSessionGetPropExString1D(uint32_t session, SvHandle *,
                                                                uint32_t id, SvHandle *value,
                                                                SvHandle *info) {
-  return RunSessionPropertyCall(session, id, info, [&](uint32_t handle) {
-    return ReadStringArray(handle, id, value, info);
-  });
+  return RunSessionPropertyCall(
+      session, id, info, [&](uint32_t handle) { return ReadStringArray(handle, id, value, info); });
 }
 extern "C" KVSV_EXPORT kvsvStatus kvsvSessionGetPropString1D(uint32_t session, uint32_t id,
                                                              SvHandle *value, SvHandle *info) {

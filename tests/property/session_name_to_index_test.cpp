@@ -1,12 +1,13 @@
 // Naming an entry of a session's list: decimal indexes, names and their prefixes, the list read
 // once per slot, and the slot's own failures.
+#include "property/session_name_to_index.h"
+
 #include <gtest/gtest.h>
 
 #include <cstring>
 
 #include "kvorproperties.h"
 #include "kvsim.h"
-#include "property/session_name_to_index.h"
 #include "support/slot_fixture.h"
 #include "svsim.h"
 
@@ -21,9 +22,16 @@ TEST(ParseDecimalStringTest, DigitsWrapInThirtyTwoBitsAndAnythingElseIsMinusOne)
     const char *text;
     int32_t expected;
   } cases[] = {
-      {"", 0},          {"0", 0},           {"42", 42},          {"007", 7},
-      {"3x", -1},       {"-1", -1},         {" 3", -1},          {"2147483647", 2147483647},
-      {"2147483648", INT32_MIN},            {"4294967299", 3},
+      {"", 0},
+      {"0", 0},
+      {"42", 42},
+      {"007", 7},
+      {"3x", -1},
+      {"-1", -1},
+      {" 3", -1},
+      {"2147483647", 2147483647},
+      {"2147483648", INT32_MIN},
+      {"4294967299", 3},
   };
   for (const auto &c : cases) {
     SCOPED_TRACE(c.text);
@@ -119,9 +127,7 @@ TEST_F(SessionNameToIndexTest, SlotAndDriverFailures) {
   EXPECT_EQ(Look(session, "A", &index), kvErrSessionBusy);
   Slot(session)->listGuard = 0;
 
-  const struct {
-    const char *function;
-  } reads[] = {{"kvGetPropertySize"}, {"kvGetProperty"}};
+  const struct { const char *function; } reads[] = {{"kvGetPropertySize"}, {"kvGetProperty"}};
   for (const auto &r : reads) {
     SCOPED_TRACE(r.function);
     kvsimFailProperty(r.function, kvPropSession_List, kvsimErrInternal, 1);
