@@ -64,7 +64,7 @@ TEST_F(KvorDatabaseProperties, FramesReadAsTheFileWritesThem) {
     uint32_t id, length, signals;
     const char *transmitter;
   } cases[] = {
-      {"DAS_steeringControl", 1160, 4, 5, "NEO"},  // BO_ 1160 DAS_steeringControl: 4 NEO
+      {"DAS_steeringControl", 1160, 4, 5, "NEO"},   // BO_ 1160 DAS_steeringControl: 4 NEO
       {"STW_ANGL_STAT", 3, 8, 0, "STW"},            // BO_ 3 STW_ANGL_STAT: 8 STW
       {"GTW_epasControl", 257, 3, 7, "NEO"},        // BO_ 257 GTW_epasControl: 3 NEO
       {"UI_autopilotControl", 1006, 8, 24, "GTW"},  // BO_ 1006, multiplexed
@@ -95,8 +95,9 @@ TEST_F(KvorDatabaseProperties, FramesReadAsTheFileWritesThem) {
   // DAS_steeringControl is received by EPAS, in every signal.
   const std::vector<uint32_t> received =
       DbHandles(DbFind(cluster_, 0x50000, "EPAS"), kvPropECU_RxFrmRefs);
-  EXPECT_NE(std::find(received.begin(), received.end(), DbFind(cluster_, 0x20000, "DAS_steeringControl")),
-            received.end());
+  EXPECT_NE(
+      std::find(received.begin(), received.end(), DbFind(cluster_, 0x20000, "DAS_steeringControl")),
+      received.end());
   EXPECT_EQ(DbHandles(cluster_, kvPropClst_ECURefs).size(), 11u);  // BU_: NEO ... XXX
 }
 
@@ -112,7 +113,7 @@ TEST_F(KvorDatabaseProperties, MultiplexingIsToldOnFrameAndSignals) {
     uint32_t value;
   } cases[] = {
       {"UI_autopilotControlIndex", true, false, 0},       // M
-      {"UI_hovEnabled", false, true, 0},                   // m0
+      {"UI_hovEnabled", false, true, 0},                  // m0
       {"UI_camBlockLaneCheckThreshold", false, true, 1},  // m1
   };
   for (const auto &c : cases) {
@@ -212,13 +213,16 @@ TEST_F(KvorDatabaseProperties, SetValuesReadBackAndBadOnesAreRefused) {
     std::vector<uint8_t> value;
     int32_t status;
   } refused[] = {
-      {frame, kvPropFrm_ID, {0x00, 0x08, 0, 0}, kvsimErrInvalidArgument},   // 0x800: not standard
-      {frame, kvPropFrm_ID, {0x88, 0x04, 0, 0}, kvsimErrObjectExists},  // DAS_steeringControl
+      {frame, kvPropFrm_ID, {0x00, 0x08, 0, 0}, kvsimErrInvalidArgument},    // 0x800: not standard
+      {frame, kvPropFrm_ID, {0x88, 0x04, 0, 0}, kvsimErrObjectExists},       // DAS_steeringControl
       {frame, kvPropFrm_PayloadLen, {9, 0, 0, 0}, kvsimErrInvalidArgument},  // no such length
       {frame, kvPropFrm_CANioMode, {0, 0, 0, 0}, kvsimErrInvalidArgument},   // 16 bytes need FD
       {frame, kvPropFrm_ID, {1, 0}, kvsimErrPropertySize},
       {frame, kvPropFrm_Name, {'9', 'x', 0}, kvsimErrInvalidName},
-      {frame, kvPropFrm_Name, {'D', 'I', '_', 't', 'o', 'r', 'q', 'u', 'e', '2', 0}, kvsimErrObjectExists},
+      {frame,
+       kvPropFrm_Name,
+       {'D', 'I', '_', 't', 'o', 'r', 'q', 'u', 'e', '2', 0},
+       kvsimErrObjectExists},
       {frame, kvPropFrm_SigRefs, {}, kvsimErrPropertyReadOnly},
       {signal, kvPropSig_NumBits, {0, 0, 0, 0}, kvsimErrInvalidArgument},
       {signal, kvPropSig_NumBits, {65, 0, 0, 0}, kvsimErrInvalidArgument},
@@ -239,7 +243,7 @@ TEST_F(KvorDatabaseProperties, SetValuesReadBackAndBadOnesAreRefused) {
 }
 
 TEST_F(KvorDatabaseProperties, ConfigStatusTellsASignalOutsideItsFrame) {
-  const uint32_t frame = DbFind(cluster_, 0x20000, "GTW_epasControl");  // 3 bytes
+  const uint32_t frame = DbFind(cluster_, 0x20000, "GTW_epasControl");        // 3 bytes
   const uint32_t signal = Signal("GTW_epasControl.GTW_epasControlChecksum");  // 23|8 big-endian
   EXPECT_EQ(DbRead<uint32_t>(frame, kvPropFrm_ConfigStatus), 0u);
   ASSERT_EQ(DbSet<uint32_t>(signal, kvPropSig_NumBits, 9), 0);  // runs into byte 3
@@ -254,9 +258,9 @@ TEST_F(KvorDatabaseProperties, ConfigStatusTellsASignalOutsideItsFrame) {
 
 TEST_F(KvorDatabaseProperties, DefaultPayloadHoldsTheStartValues) {
   const uint32_t frame = DbFind(cluster_, 0x20000, "UI_autopilotControl");
-  const uint32_t index = Signal("UI_autopilotControl.UI_autopilotControlIndex");  // 0|3 M
+  const uint32_t index = Signal("UI_autopilotControl.UI_autopilotControlIndex");    // 0|3 M
   const uint32_t m1 = Signal("UI_autopilotControl.UI_camBlockLaneCheckThreshold");  // 4|6 m1
-  const uint32_t m0 = Signal("UI_autopilotControl.UI_hovEnabled");  // 3|1 m0
+  const uint32_t m0 = Signal("UI_autopilotControl.UI_hovEnabled");                  // 3|1 m0
   ASSERT_EQ(DbSet<double>(m1, kvPropSig_Default, 0.01587 * 0x2A), 0);
   ASSERT_EQ(DbSet<double>(m0, kvPropSig_Default, 1.0), 0);
   EXPECT_EQ(DbBytes(frame, kvPropFrm_DefaultPayload),

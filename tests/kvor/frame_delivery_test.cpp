@@ -34,7 +34,7 @@ TEST_F(KvorFrameDelivery, EveryJoinedPairCarriesFramesToTheOtherEndOnly) {
     const uint32_t other = Create(c.bystander, kvMode_FrameInStream);
     kvsimSetClock(kNoon);
     Rec written = c.sent;
-    written.timestamp = 77;  // the driver stamps frames itself
+    written.timestamp = 77;                              // the driver stamps frames itself
     const std::vector<uint8_t> bytes = Pack({written});  // up to 8 bytes both forms agree
     ASSERT_EQ(kvWriteFrame(writer, bytes.data(), static_cast<uint32_t>(bytes.size()), 0.0), 0);
     Rec expected = c.sent;
@@ -100,8 +100,8 @@ TEST_F(KvorFrameDelivery, FrameSessionsHaveTheirPropertiesBeforeAnyIsSet) {
     uint32_t application;
     uint32_t payloadMax;
   };
-  const Case cases[] = {{"CAN1", 0, 0, 8},   {"CAN1", 1, 0, 64},    {"CAN2", 1, 1, 1785},
-                        {"LIN2", 0, 0, 8},   {"FlexRay1", 0, 0, 254}, {"ENET1", 0, 0, 1500}};
+  const Case cases[] = {{"CAN1", 0, 0, 8}, {"CAN1", 1, 0, 64},      {"CAN2", 1, 1, 1785},
+                        {"LIN2", 0, 0, 8}, {"FlexRay1", 0, 0, 254}, {"ENET1", 0, 0, 1500}};
   for (const Case &c : cases) {
     SCOPED_TRACE(c.interfaceName);
     const uint32_t session = Create(c.interfaceName, kvMode_FrameInQueued, "0x10:5,0x11");

@@ -75,8 +75,7 @@ TEST_F(KvorFrameQueue, QueuedRecordsComeBackAsTheyWereGiven) {
   EXPECT_EQ(kvsimQueueFrames(reader, golden.data(), static_cast<uint32_t>(golden.size())), 3);
   std::vector<uint8_t> buffer(golden.size() + 8);
   uint32_t got = 0;
-  ASSERT_EQ(kvReadFrame(reader, buffer.data(), static_cast<uint32_t>(buffer.size()), 0.0, &got),
-            0);
+  ASSERT_EQ(kvReadFrame(reader, buffer.data(), static_cast<uint32_t>(buffer.size()), 0.0, &got), 0);
   ASSERT_EQ(got, golden.size());
   EXPECT_TRUE(std::equal(golden.begin(), golden.end(), buffer.begin())) << "byte for byte";
 

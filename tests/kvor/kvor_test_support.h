@@ -181,9 +181,9 @@ inline void SetEcho(uint32_t session) {
 inline std::vector<Rec> Drain(uint32_t session) {
   std::vector<uint8_t> buffer(1 << 16);
   uint32_t got = 0;
-  EXPECT_EQ(kvhdnReadFrame(session, buffer.data(), static_cast<uint32_t>(buffer.size()), 4096,
-                           0.0, &got),
-            0);
+  EXPECT_EQ(
+      kvhdnReadFrame(session, buffer.data(), static_cast<uint32_t>(buffer.size()), 4096, 0.0, &got),
+      0);
   return Unpack(buffer.data(), got);
 }
 

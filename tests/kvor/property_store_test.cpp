@@ -67,9 +67,9 @@ TEST_F(KvorSessionProperties, RefusedReadsAndSetsChangeNothing) {
   ASSERT_EQ(kvSetProperty(session, kvPropSession_IntfBaudRate, 4, &baud), 0);
   // A buffer one byte short of the value.
   for (const auto &[id, needed] : {std::pair<uint32_t, uint32_t>{kvPropSession_IntfBaudRate, 4},
-                                  {kvPropSession_Mode, 4},
-                                  {kvPropSession_List, sizeof "Alpha,Beta"},
-                                  {kvPropSession_IntfName, sizeof "CAN2"}}) {
+                                   {kvPropSession_Mode, 4},
+                                   {kvPropSession_List, sizeof "Alpha,Beta"},
+                                   {kvPropSession_IntfName, sizeof "CAN2"}}) {
     SCOPED_TRACE(testing::Message() << std::hex << id);
     Bytes buffer(needed, 0xEE);
     EXPECT_EQ(kvGetProperty(session, id, needed - 1, buffer.data()), kvsimErrBufferTooSmall);
@@ -80,11 +80,11 @@ TEST_F(KvorSessionProperties, RefusedReadsAndSetsChangeNothing) {
   // A fixed-size type takes exactly its size; a refused value is not stored.
   const uint8_t bytes[16] = {};
   for (const auto &[id, size] : {std::pair<uint32_t, uint32_t>{kvPropSession_ResampRate, 4},
-                                {kvPropSession_IntfBaudRate, 2},
-                                {kvPropSession_IntfBaudRate, 8},
-                                {kvPropSession_AutoStart, 4},
-                                {kvPropSession_IntfBaudRate64, 4},
-                                {kvPropSession_J1939ECU, 0}}) {
+                                 {kvPropSession_IntfBaudRate, 2},
+                                 {kvPropSession_IntfBaudRate, 8},
+                                 {kvPropSession_AutoStart, 4},
+                                 {kvPropSession_IntfBaudRate64, 4},
+                                 {kvPropSession_J1939ECU, 0}}) {
     SCOPED_TRACE(testing::Message() << std::hex << id << " size " << std::dec << size);
     EXPECT_EQ(kvSetProperty(session, id, size, bytes), kvsimErrPropertySize);
     if (id != kvPropSession_IntfBaudRate) {
@@ -94,9 +94,9 @@ TEST_F(KvorSessionProperties, RefusedReadsAndSetsChangeNothing) {
   }
   EXPECT_EQ(ReadU32(session, kvPropSession_IntfBaudRate), baud);
   // The session's definition cannot be set.
-  for (uint32_t id : {kvPropSession_Mode, kvPropSession_NumInList, kvPropSession_Protocol,
-                      kvPropSession_List, kvPropSession_IntfName, kvPropSession_DatabaseName,
-                      kvPropSession_ClusterName}) {
+  for (uint32_t id :
+       {kvPropSession_Mode, kvPropSession_NumInList, kvPropSession_Protocol, kvPropSession_List,
+        kvPropSession_IntfName, kvPropSession_DatabaseName, kvPropSession_ClusterName}) {
     EXPECT_EQ(kvSetProperty(session, id, 4, bytes), kvsimErrPropertyReadOnly) << std::hex << id;
   }
   EXPECT_EQ(ReadU32(session, kvPropSession_Mode), 0u);

@@ -79,7 +79,8 @@ TEST_F(KvorSessionControl, TheInterfaceControlsKnowEveryInterfaceAndNothingElse)
     EXPECT_EQ(kvsimInterfaceStarted(name), 1) << name;
     EXPECT_EQ(kvsimBlinkMode(name), kvsimBlinkOff) << name;
   }
-  for (const char *name : {"CAN5", "", "CAN1 ", "FlexRay", "ENET1/monitor", static_cast<const char *>(nullptr)}) {
+  for (const char *name :
+       {"CAN5", "", "CAN1 ", "FlexRay", "ENET1/monitor", static_cast<const char *>(nullptr)}) {
     EXPECT_EQ(kvsimInterfaceStarted(name), -1) << (name ? name : "(null)");
     EXPECT_EQ(kvsimBlinkMode(name), -1) << (name ? name : "(null)");
   }
@@ -135,8 +136,11 @@ TEST_F(KvorSessionControl, OnlyFlexRaySessionsGiveAMacrotickTimingSource) {
 using KvorTerminals = KvorTest;
 
 constexpr const char *kTerminals[] = {
-    "StartTrigger", "Interface/StartTrigger", "FrontPanel0", "FrontPanel1", "PXI_Trig0",
-    "PXI_Trig1",    "PXI_Trig2",              "PXI_Trig3",   "PXI_Trig4",   "PXI_Trig5",
+    "StartTrigger", "Interface/StartTrigger",
+    "FrontPanel0",  "FrontPanel1",
+    "PXI_Trig0",    "PXI_Trig1",
+    "PXI_Trig2",    "PXI_Trig3",
+    "PXI_Trig4",    "PXI_Trig5",
     "PXI_Trig6",    "PXI_Trig7",
 };
 

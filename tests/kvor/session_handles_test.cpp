@@ -27,9 +27,9 @@ TEST_F(KvorSessionHandles, LowBitsStayUniqueAmongOpenSessionsThroughCreatesAndCl
     if (openByLowBits.empty() || random() % 3 != 0) {
       uint32_t handle = 0;
       const char *name = step % 10 == 0 ? "ENET1/monitor" : kInterfaceNames[step % 9];
-      const int32_t status = step % 5 == 0 ? kvhdnCreateErrorSession(kvsimErrInternal, &handle)
-                                           : kvCreateSession("", "", "A", name,
-                                                             kvMode_SignalInSinglePoint, &handle);
+      const int32_t status =
+          step % 5 == 0 ? kvhdnCreateErrorSession(kvsimErrInternal, &handle)
+                        : kvCreateSession("", "", "A", name, kvMode_SignalInSinglePoint, &handle);
       ASSERT_EQ(status, 0) << "step " << step;
       // An index the library can use, and a top byte it does not take for a system object
       // (0x01), a database object (bit 7) or "no class" (0x0F).
@@ -74,21 +74,27 @@ TEST_F(KvorSessionHandles, AFullTableRefusesTheNextSessionUntilOneIsCleared) {
 
 // Handles that name no open session get each call's refusal; error sessions get their failure.
 TEST_F(KvorSessionHandles, EveryCallAnswersAHandleThatIsNoWorkingSessionAndTouchesNothing) {
+  // Error sessions first, so that no session takes the index next to the live one; all of
+  // them made before any is used, since each must keep its own failure.
+  const int32_t failures[] = {kOpenFailure, kvsimErrUnknownInterface, -1};
+  uint32_t errors[3] = {};
+  for (int i = 0; i < 3; ++i) ASSERT_EQ(kvhdnCreateErrorSession(failures[i], &errors[i]), 0);
   const uint32_t cleared = Create("CAN1", kvMode_SignalInSinglePoint, "A");
   ASSERT_EQ(kvClear(cleared), 0);
   const uint32_t live = Create("CAN1", kvMode_SignalInSinglePoint, "A");
-  struct {
+  const struct {
     uint32_t handle;
     int32_t failure;  // 0: no session at all
-  } cases[] = {{0u, 0}, {cleared, 0}, {live + 1, 0}, {live ^ 0x00010000u, 0}, {0x0F000001u, 0},
-               {0x80000001u, 0}, {0x20FF1FFFu, 0}, {0, kOpenFailure},
-               {0, kvsimErrUnknownInterface}, {0, -1}};
-  // All made before any is used: each must keep its own failure.
-  for (auto &c : cases) {
-    if (c.failure != 0) {
-      ASSERT_EQ(kvhdnCreateErrorSession(c.failure, &c.handle), 0);
-    }
-  }
+  } cases[] = {{0u, 0},
+               {cleared, 0},
+               {live + 1, 0},
+               {live ^ 0x00010000u, 0},
+               {0x0F000001u, 0},
+               {0x80000001u, 0},
+               {0x20FF1FFFu, 0},
+               {errors[0], failures[0]},
+               {errors[1], failures[1]},
+               {errors[2], failures[2]}};
   UseOutputs outputs;
   const std::vector<HandleUse> uses = HandleUses(outputs);
   for (const auto &c : cases) {

@@ -1,13 +1,13 @@
 // Signal values in payloads: every placement of both byte orders against an independent reading
 // of the payload as one integer, golden payloads, and the physical conversion at its edges.
+#include "signal_codec.h"
+
 #include <gtest/gtest.h>
 
 #include <cmath>
 #include <cstring>
 #include <limits>
 #include <vector>
-
-#include "signal_codec.h"
 
 namespace {
 
@@ -54,9 +54,8 @@ TEST(SignalCodec, EveryPlacementInEightBytesMatchesTheOracle) {
         const uint64_t background = NextRandom(&seed);
         std::memcpy(payload, &background, 8);
         // Whether it fits, told by the oracle's own arithmetic.
-        const uint32_t first = order == ByteOrder::kLittleEndian
-                                   ? start
-                                   : (start / 8) * 8 + (7 - start % 8);
+        const uint32_t first =
+            order == ByteOrder::kLittleEndian ? start : (start / 8) * 8 + (7 - start % 8);
         ASSERT_EQ(SignalFits(s, 8), first + bits <= 64) << start << "|" << bits;
         if (first + bits > 64) continue;
         ASSERT_EQ(ExtractRaw(s, payload), OracleExtract(s, payload)) << start << "|" << bits;
@@ -89,8 +88,7 @@ TEST(SignalCodec, GoldenPayloads) {
       {"motorola 15 bits at 6", Layout(ByteOrder::kBigEndian, 6, 15), 0x1234, {0x12, 0x34, 0, 0}},
       {"motorola 15 bits at 6, top", Layout(ByteOrder::kBigEndian, 6, 15), 0x4000, {0x40, 0, 0, 0}},
       {"motorola 2 bits at 0", Layout(ByteOrder::kBigEndian, 0, 2), 0x3, {0x01, 0x80, 0, 0}},
-      {"motorola 12 bits at 19", Layout(ByteOrder::kBigEndian, 19, 12), 0xABC,
-       {0, 0, 0x0A, 0xBC}},
+      {"motorola 12 bits at 19", Layout(ByteOrder::kBigEndian, 19, 12), 0xABC, {0, 0, 0x0A, 0xBC}},
       {"motorola 1 bit at 31", Layout(ByteOrder::kBigEndian, 31, 1), 1, {0, 0, 0, 0x80}},
   };
   for (const auto &c : cases) {

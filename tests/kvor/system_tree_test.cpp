@@ -108,14 +108,16 @@ TEST_F(KvorSystemTree, HardwarePropertiesAreReadOnlyAndOnlyHandlesOfTheOpenTreeA
   EXPECT_EQ(kvsimOpenSystemCount(), 1);
   EXPECT_EQ(kvSystemClose(first), kvsimErrInvalidObject) << "closed twice";
   const uint32_t unknown[] = {
-      first, firstDevice, firstIntf,  // closed with their system
-      system | 0x00000300u,           // a third device
-      system | 0x00000107u,           // port 7 of a six-port device
-      system | 0x00000204u,           // port 4 of a three-port device
-      system | 0x00000010u,           // bits the tree does not use
-      system | 0x00000001u,           // an interface without a device
-      0x01000000u,                    // system number 0
-      system + 0x00010000u,           // a system that was never opened
+      first,
+      firstDevice,
+      firstIntf,             // closed with their system
+      system | 0x00000300u,  // a third device
+      system | 0x00000107u,  // port 7 of a six-port device
+      system | 0x00000204u,  // port 4 of a three-port device
+      system | 0x00000010u,  // bits the tree does not use
+      system | 0x00000001u,  // an interface without a device
+      0x01000000u,           // system number 0
+      system + 0x00010000u,  // a system that was never opened
   };
   for (uint32_t handle : unknown) {
     EXPECT_EQ(kvGetPropertySize(handle, kvPropIntf_Name, &size), kvsimErrInvalidObject)
