@@ -23,6 +23,15 @@ void CountText(SvHandle string) {
   static_cast<SvStr *>(*string)->cnt = static_cast<int32_t>(std::strlen(TextOf(string)));
 }
 
+// A failed read keeps the host's count, unless the resize before it left the block too small to
+// hold that many bytes: then the string is emptied rather than left to be read past its end.
+void KeepCountInBlock(SvHandle string) {
+  if (string == nullptr) return;
+  SvStr *text = static_cast<SvStr *>(*string);
+  const size_t room = svGetHandleSize(string) - kHostCountBytes;
+  if (text->cnt < 0 || static_cast<size_t>(text->cnt) > room) text->cnt = 0;
+}
+
 // The host sees "database.cluster", read as two properties into one handle.
 Status ReadClusterName(uint32_t handle, SvHandle *value) {
   if (value == nullptr) return kvErrNullArgument;
@@ -37,12 +46,19 @@ Status ReadClusterName(uint32_t handle, SvHandle *value) {
   if (status < 0) return status;
   char *text = TextOf(*value);
   status = tSessionPropertyCalls::Get(handle, kvPropSession_DatabaseName, sum, text);
-  if (status < 0) return status;
+  if (status < 0) {
+    KeepCountInBlock(*value);
+    return status;
+  }
   const size_t length = std::strlen(text);
   text[length] = '.';
   status = tSessionPropertyCalls::Get(handle, kvPropSession_ClusterName,
                                       sum - static_cast<uint32_t>(length), text + length + 1);
-  if (status >= 0) CountText(*value);
+  if (status >= 0) {
+    CountText(*value);
+  } else {
+    KeepCountInBlock(*value);
+  }
   return status;
 }
 
@@ -50,7 +66,7 @@ Status ReadString(uint32_t handle, uint32_t id, SvHandle *value) {
   if (id == kvPropSession_ClusterName) return ReadClusterName(handle, value);
   // The handle has room behind the driver's bytes: a text without its NUL ends there.
   const auto countText = [value](Status status, uint32_t size) {
-    if (status < 0) return;
+    if (status < 0) return KeepCountInBlock(*value);
     TextOf(*value)[size] = '\0';
     CountText(*value);
   };

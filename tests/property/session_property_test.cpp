@@ -255,6 +255,25 @@ TEST_F(SessionPropertyTest, ArrayReadStoresTheCountAfterAFailedReadButNotAfterAF
   }
 }
 
+// A failed text read keeps the string's count while the block still holds that many bytes;
+// after the resize left it smaller, the string is empty instead of reaching past its block.
+TEST_F(SessionPropertyTest, AFailedStringReadNeverCountsPastTheBlock) {
+  const uint32_t session = MakeSession("A", 0);
+  const struct {
+    const char *held;
+    int32_t count;
+  } cases[] = {{"CA", 2}, {"a text much longer than the name of an interface", 0}};
+  for (const auto &c : cases) {
+    SCOPED_TRACE(c.held);
+    SvHandle read = Keep(svsimMakeString(c.held));
+    kvsimFailProperty("kvGetProperty", kvPropSession_IntfName, kvsimErrInternal, 1);
+    EXPECT_EQ(kvsvSessionGetPropString(session, kvPropSession_IntfName, &read, &info_),
+              kvsimErrInternal);
+    EXPECT_EQ(static_cast<SvStr *>(*read)->cnt, c.count);
+    EXPECT_LE(static_cast<size_t>(static_cast<SvStr *>(*read)->cnt) + 4, svGetHandleSize(read));
+  }
+}
+
 TEST_F(SessionPropertyTest, EmptyArraysAreSentAsNothing) {
   const uint32_t session = MakeSession("A", 0);
   const uint32_t id = kvPropSession_IntfCustCodeData;
