@@ -90,11 +90,14 @@ class cDrive {
   cDrive(const tLibraryExports &library, const tDriveOptions &options, tDriveResult &result)
       : lib_(library), options_(options), r_(result) {}
 
+  // A drive that fails still ends its program, so that the host closes what was opened.
   void Run() {
-    if (!Prepare() || !OpenSessions()) return;
-    Play();
-    if (r_.status >= 0) ReadPairs();
-    if (r_.status >= 0) ReadWaveforms();
+    if (!Prepare()) return;
+    if (OpenSessions()) {
+      Play();
+      if (r_.status >= 0) ReadPairs();
+      if (r_.status >= 0) ReadWaveforms();
+    }
     End();
   }
 
@@ -108,6 +111,17 @@ class cDrive {
     return false;
   }
   bool Check(const char *call, int32_t status) { return status >= 0 || Fail(call, status); }
+  // A property call leaves a text in its error information ("\nProperty: Name") for any status
+  // but 0; the host owns that handle.
+  bool CheckProperty(const std::string &call, int32_t status, SvHandle &info) {
+    const std::string text = Text(info);
+    if (info != nullptr) svDisposeHandle(info);
+    info = nullptr;
+    if (status >= 0) return true;
+    const std::string prefix = "\nProperty: ";
+    r_.failedProperty = text.rfind(prefix, 0) == 0 ? text.substr(prefix.size()) : text;
+    return Fail(call, status);
+  }
 
   bool Prepare() {
     r_.readInterface = PartnerInterface(options_.interfaceName);
@@ -115,6 +129,7 @@ class cDrive {
       return Fail("no partner on the network of " + options_.interfaceName, kvErrInternal);
     kvsimReset();
     svsimReset();
+    if (options_.afterReset) options_.afterReset();
     std::string what;
     int32_t status = 0;
     r_.signals = PickDriveSignals(options_.dbcPath, options_.maxSignals, what, status);
@@ -185,12 +200,33 @@ class cDrive {
       lib_.sessionOpen(&name, &handles_[i], 0);
       Register(name, handles_[i]);
       svDisposeHandle(name);
-      // The open always succeeds for the host; a failure shows at the session's first use.
-      uint32_t size = 0;
-      const int32_t status = kvGetPropertySize(handles_[i], kvPropSession_IntfName, &size);
-      if (!Check(("kvsvSessionOpen " + names[i]).c_str(), status)) return false;
+      // The open always succeeds for the host; a failure shows at the session's first use,
+      // here the first property read.
+      if (!Summarize(names[i], handles_[i])) return false;
       ++r_.sessionsOpened;
     }
+    return true;
+  }
+
+  bool Summarize(const std::string &name, uint32_t session) {
+    tSessionSummary summary;
+    summary.name = name;
+    SvHandle info = nullptr;
+    SvHandle text = nullptr;
+    const int32_t status = lib_.sessionGetPropString(session, kvPropSession_IntfName, &text, &info);
+    summary.interfaceName = Text(text);
+    if (text != nullptr) svDisposeHandle(text);
+    const std::string call = " of " + name;
+    if (!CheckProperty("kvsvSessionGetPropString" + call, status, info) ||
+        !CheckProperty("kvsvSessionGetPropU32" + call,
+                       lib_.sessionGetPropU32(session, kvPropSession_Mode, &summary.mode, &info),
+                       info) ||
+        !CheckProperty(
+            "kvsvSessionGetPropU32" + call,
+            lib_.sessionGetPropU32(session, kvPropSession_NumInList, &summary.numInList, &info),
+            info))
+      return false;
+    r_.sessions.push_back(summary);
     return true;
   }
 
@@ -331,6 +367,12 @@ class cDrive {
     int32_t count = 0;
     if (array != nullptr) std::memcpy(&count, *array, 4);
     return count;
+  }
+  // The text of a counted host string; empty for none.
+  static std::string Text(SvHandle string) {
+    if (string == nullptr) return {};
+    return std::string(static_cast<const char *>(*string) + 4,
+                       static_cast<size_t>(std::max(Count(string), 0)));
   }
   static double *DoubleData(SvHandle array) {
     return reinterpret_cast<double *>(static_cast<uint8_t *>(*array) + 8);

@@ -5,6 +5,7 @@
 #define KVSVDEMO_DRIVE_SCENARIO_H
 
 #include <cstdint>
+#include <functional>
 #include <string>
 #include <vector>
 
@@ -19,6 +20,9 @@ struct tDriveOptions {
   std::string directory;               // the program's own directory: the session file goes here
   int32_t steps = 300;                 // the drive lasts this many kStepSeconds
   size_t maxSignals = 6;
+  // Runs once the stand-ins are reset, before the first call of the drive: a test arms its
+  // faults here.
+  std::function<void()> afterReset;
 };
 
 // A frame goes every kStepSeconds where the database gives it no cycle time of its own.
@@ -53,11 +57,23 @@ struct tWaveform {
   std::vector<double> samples;
 };
 
+// A session of the project as the library reports its properties.
+struct tSessionSummary {
+  std::string name;
+  std::string interfaceName;
+  uint32_t mode = 0;
+  uint32_t numInList = 0;
+};
+
 struct tDriveResult {
-  // The first call that failed: its name and status; status 0 if none did.
+  // The first call that failed: its name and status, the driver's text for the status and, for a
+  // property call, the property its error information names; status 0 if none failed.
   std::string failedCall;
   int32_t status = 0;
   std::string statusText;
+  std::string failedProperty;
+
+  std::vector<tSessionSummary> sessions;
 
   std::string readInterface;
   std::vector<tDriveSignal> signals;

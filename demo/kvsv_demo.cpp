@@ -36,6 +36,15 @@ std::string Hex(const std::vector<uint8_t> &bytes) {
   return text;
 }
 
+void PrintSessions(const tDriveResult &r) {
+  std::printf("\nSessions opened by name:\n  %-28s %-10s %5s %s\n", "name", "interface", "mode",
+              "items");
+  for (const tSessionSummary &s : r.sessions) {
+    std::printf("  %-28s %-10s %5" PRIu32 " %" PRIu32 "\n", s.name.c_str(),
+                s.interfaceName.c_str(), s.mode, s.numInList);
+  }
+}
+
 void PrintFrames(const tDriveResult &r) {
   std::printf("\nFrames read on %s (last step):\n  %-12s %-10s %-4s %s\n", r.readInterface.c_str(),
               "time (s)", "id", "len", "payload");
@@ -133,10 +142,13 @@ int main(int argc, char **argv) {
   std::printf("Drive on %s with %s\n", options.interfaceName.c_str(), options.dbcPath.c_str());
   const tDriveResult result = RunDrive(exports, options);
   if (result.status < 0) {
-    std::fprintf(stderr, "%s failed: status 0x%08" PRIX32 " (%s)\n", result.failedCall.c_str(),
-                 static_cast<uint32_t>(result.status), result.statusText.c_str());
+    std::fprintf(stderr, "%s failed: status 0x%08" PRIX32 " (%s)%s%s\n",
+                 result.failedCall.c_str(), static_cast<uint32_t>(result.status),
+                 result.statusText.c_str(), result.failedProperty.empty() ? "" : ", property ",
+                 result.failedProperty.c_str());
     return 1;
   }
+  PrintSessions(result);
   PrintFrames(result);
   PrintSignals(result);
   PrintCounts(result);

@@ -19,6 +19,8 @@ tLibraryExports ExportsOf(void *library, std::string &error) {
   Find(library, "kvsvStatusToString", e.statusToString, error);
   Find(library, "kvsvSvTimeToRawTime", e.svTimeToRawTime, error);
   Find(library, "kvsvSessionOpen", e.sessionOpen, error);
+  Find(library, "kvsvSessionGetPropU32", e.sessionGetPropU32, error);
+  Find(library, "kvsvSessionGetPropString", e.sessionGetPropString, error);
   Find(library, "kvsvWriteSignalSinglePoint", e.writeSignalSinglePoint, error);
   Find(library, "kvsvReadSignalSinglePoint", e.readSignalSinglePoint, error);
   Find(library, "kvsvReadSignalXY", e.readSignalXY, error);

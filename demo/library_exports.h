@@ -13,6 +13,8 @@ struct tLibraryExports {
   decltype(&kvsvStatusToString) statusToString = nullptr;
   decltype(&kvsvSvTimeToRawTime) svTimeToRawTime = nullptr;
   decltype(&kvsvSessionOpen) sessionOpen = nullptr;
+  decltype(&kvsvSessionGetPropU32) sessionGetPropU32 = nullptr;
+  decltype(&kvsvSessionGetPropString) sessionGetPropString = nullptr;
   decltype(&kvsvWriteSignalSinglePoint) writeSignalSinglePoint = nullptr;
   decltype(&kvsvReadSignalSinglePoint) readSignalSinglePoint = nullptr;
   decltype(&kvsvReadSignalXY) readSignalXY = nullptr;

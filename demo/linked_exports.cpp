@@ -8,6 +8,8 @@ tLibraryExports LinkedExports() {
   e.statusToString = &kvsvStatusToString;
   e.svTimeToRawTime = &kvsvSvTimeToRawTime;
   e.sessionOpen = &kvsvSessionOpen;
+  e.sessionGetPropU32 = &kvsvSessionGetPropU32;
+  e.sessionGetPropString = &kvsvSessionGetPropString;
   e.writeSignalSinglePoint = &kvsvWriteSignalSinglePoint;
   e.readSignalSinglePoint = &kvsvReadSignalSinglePoint;
   e.readSignalXY = &kvsvReadSignalXY;

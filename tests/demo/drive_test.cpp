@@ -8,11 +8,13 @@
 #include <cmath>
 #include <filesystem>
 #include <fstream>
+#include <functional>
 #include <string>
 #include <vector>
 
 #include "drive_scenario.h"
 #include "kvsim.h"
+#include "kvsvplatform.h"
 #include "paths/paths_test_support.h"
 
 namespace {
@@ -31,8 +33,10 @@ std::vector<std::string> FieldFiles() {
 }
 
 tDriveResult Drive(const std::string &dbc, const std::string &interfaceName,
-                   const kvsvtest::cTempDir &directory) {
+                   const kvsvtest::cTempDir &directory,
+                   std::function<void()> afterReset = nullptr) {
   tDriveOptions options;
+  options.afterReset = std::move(afterReset);
   options.dbcPath = dbc.find('/') == std::string::npos ? std::string(KVSV_DBC_DIR) + "/" + dbc : dbc;
   options.interfaceName = interfaceName;
   options.directory = directory.Path();
@@ -116,8 +120,19 @@ void ExpectEverythingReadBack(const tDriveResult &r) {
 
   EXPECT_EQ(r.steadyAllocations, 0u);
   EXPECT_GT(r.steadyFrames, 0);
-  // One output session per frame, then the five that read and convert.
+  // One output session per frame, then the five that read and convert, each as its properties
+  // tell it through the library.
   EXPECT_EQ(r.sessionsOpened, static_cast<int32_t>(r.groups.size()) + 5);
+  ASSERT_EQ(r.sessions.size(), static_cast<size_t>(r.sessionsOpened));
+  for (size_t g = 0; g < r.groups.size(); ++g) {
+    EXPECT_EQ(r.sessions[g].name, r.groups[g].session);
+    EXPECT_EQ(r.sessions[g].interfaceName, "CAN1");
+    EXPECT_EQ(r.sessions[g].mode, static_cast<uint32_t>(kvMode_SignalOutSinglePoint));
+    EXPECT_EQ(r.sessions[g].numInList, r.groups[g].signals.size());
+  }
+  EXPECT_EQ(r.sessions.back().interfaceName, r.readInterface);
+  EXPECT_EQ(r.sessions.back().mode, static_cast<uint32_t>(kvMode_SignalInWaveform));
+  EXPECT_EQ(r.sessions.back().numInList, n);
   EXPECT_EQ(r.closesAtEnd, r.sessionsOpened);
   EXPECT_EQ(r.sessionsLeftOpen, 0);
 }
@@ -205,22 +220,41 @@ TEST(Drive, PicksSpeedSteeringAndGearByName) {
 
 TEST(Drive, AFailureNamesTheCallAndItsStatus) {
   kvsvtest::cTempDir directory;
+  const auto failModeRead = [] {
+    kvsimFailProperty("kvGetProperty", kvPropSession_Mode, kvsimErrPropertyUnknown, 1);
+  };
+  const auto failNameRead = [] {
+    kvsimFailProperty("kvGetPropertySize", kvPropSession_IntfName, kvsimErrPropertyUnknown, 1);
+  };
   const struct {
     const char *dbc;
     const char *interfaceName;
+    std::function<void()> afterReset;
     int32_t status;
     const char *call;
+    const char *property;  // named by the error information of a property call
   } cases[] = {
-      {"no_such_file.dbc", "CAN1", kvsimErrDatabaseNotFound, "kvdbOpenDatabase "},
-      {"tesla_can.dbc", "LIN1", kvErrInternal, "no partner on the network of LIN1"},
+      {"no_such_file.dbc", "CAN1", nullptr, kvsimErrDatabaseNotFound, "kvdbOpenDatabase ", ""},
+      {"tesla_can.dbc", "LIN1", nullptr, kvErrInternal, "no partner on the network of LIN1", ""},
+      {"tesla_can.dbc", "CAN1", failModeRead, kvsimErrPropertyUnknown,
+       "kvsvSessionGetPropU32 of Drive_DI_torque2", "Mode"},
+      {"tesla_can.dbc", "CAN1", failNameRead, kvsimErrPropertyUnknown,
+       "kvsvSessionGetPropString of Drive_DI_torque2", "IntfName"},
   };
   for (const auto &c : cases) {
-    SCOPED_TRACE(c.dbc + std::string(" on ") + c.interfaceName);
-    const tDriveResult r = Drive(c.dbc, c.interfaceName, directory);
+    SCOPED_TRACE(c.dbc + std::string(" on ") + c.interfaceName + ", " + c.call);
+    const tDriveResult r = Drive(c.dbc, c.interfaceName, directory, c.afterReset);
     EXPECT_EQ(r.status, c.status);
     EXPECT_EQ(r.failedCall.rfind(c.call, 0), 0u) << r.failedCall;
     EXPECT_FALSE(r.statusText.empty());
+    EXPECT_EQ(r.failedProperty, c.property);
     EXPECT_TRUE(r.written.empty());
+    // Once sessions were opened, the program still ends: the host closes them all, the one
+    // whose property failed included.
+    if (*c.property != '\0') {
+      EXPECT_EQ(r.closesAtEnd, r.sessionsOpened + 1);
+      EXPECT_EQ(r.sessionsLeftOpen, 0);
+    }
   }
 }
 
