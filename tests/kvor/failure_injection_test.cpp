@@ -1,5 +1,6 @@
 // Injected statuses: for the next N calls, until cleared, or for one property only. A failure
 // replaces the call; a warning rides on a call that succeeds.
+#include "control_calls.h"
 #include "kvor_test_support.h"
 
 namespace {

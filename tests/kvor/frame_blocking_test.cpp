@@ -3,7 +3,7 @@
 #include <chrono>
 #include <future>
 
-#include "kvor_test_support.h"
+#include "frame_test_support.h"
 
 namespace {
 

@@ -3,7 +3,7 @@
 // keep the latest frame of each item; frame sessions have their defaults before any is set.
 #include <string>
 
-#include "kvor_test_support.h"
+#include "frame_test_support.h"
 
 namespace {
 

@@ -4,7 +4,7 @@
 #include <cmath>
 #include <iterator>
 
-#include "kvor_test_support.h"
+#include "frame_test_support.h"
 
 namespace {
 

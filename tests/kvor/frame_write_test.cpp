@@ -5,7 +5,7 @@
 #include <algorithm>
 #include <cmath>
 
-#include "kvor_test_support.h"
+#include "frame_test_support.h"
 
 namespace {
 

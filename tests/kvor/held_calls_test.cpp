@@ -4,6 +4,7 @@
 #include <future>
 #include <vector>
 
+#include "control_calls.h"
 #include "kvor_test_support.h"
 
 namespace {

@@ -8,6 +8,7 @@
 #include <set>
 #include <vector>
 
+#include "control_calls.h"
 #include "kvor_test_support.h"
 
 namespace {

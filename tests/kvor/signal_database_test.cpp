@@ -5,7 +5,7 @@
 #include <iterator>
 #include <vector>
 
-#include "kvor_test_support.h"
+#include "frame_test_support.h"
 #include "signal_test_support.h"
 
 namespace {
