@@ -1,7 +1,7 @@
 // The host's waveform array: its table of operations at the fixed positions, samples in handles
-// that count and fail as every handle does, and a Lock without its Unlock stopping the process.
-// What Lock describes and what Unlock keeps is checked by the library's waveform tests, which
-// write and read every sample, start time and interval through them.
+// that count and fail as every handle does, locks that fail on request, and a Lock without its
+// Unlock stopping the process. What Lock describes and what Unlock keeps is checked by the
+// library's waveform tests, which write and read every sample, start time and interval.
 #include <gtest/gtest.h>
 
 #include "host_fixture.h"
@@ -41,6 +41,33 @@ TEST_F(WaveformArray, ResizeMakesResizesAndFreesSampleHandles) {
   svsimFailResizeAt(1);
   EXPECT_EQ(array->ops->Resize(array, 6, 2, 9), SVSIM_ERR_MEMORY);
   EXPECT_EQ(svsimWaveformCalls(array, 6), 6u);
+  svsimDisposeWaveformArray(array);
+}
+
+TEST_F(WaveformArray, LocksFailOnRequestAndRefuseWhatTheyCannotHold) {
+  SvWaveformArray *array = svsimMakeWaveformArray(2, 1);
+  SvWaveformDescriptor descriptors[3] = {};
+  const double sample = 1.5;
+  svsimFailAll(1);  // locks are not memory: they go on
+  svsimFailWaveformLockAt(2);
+  EXPECT_EQ(array->ops->Lock(array, 1, 3, descriptors), SVSIM_ERR_ARGUMENT) << "too many";
+  EXPECT_EQ(array->ops->Lock(array, 1, 1, descriptors), 0);
+  EXPECT_EQ(svsimWaveformWrite(array, 0, &sample, 1), -1) << "not while locked";
+  EXPECT_EQ(array->ops->Unlock(array, 1, descriptors), 0);
+  EXPECT_EQ(array->ops->Lock(array, 1, 1, descriptors), SVSIM_ERR_LOCK);
+  svsimFailAll(0);
+  EXPECT_EQ(svsimWaveformLocked(array), 0);
+  EXPECT_EQ(array->ops->Unlock(array, 1, descriptors), 0);  // taken, and counted
+  EXPECT_EQ(svsimStrayWaveformUnlocks(), 1u);
+  EXPECT_EQ(array->ops->Lock(array, 2, 0, nullptr), 0);  // a lock of nothing opens nothing
+  EXPECT_EQ(svsimWaveformLocked(array), 0);
+  svsimFailWaveformUnlockAt(1);
+  ASSERT_EQ(array->ops->Lock(array, 2, 1, descriptors), 0);
+  EXPECT_EQ(array->ops->Unlock(array, 1, descriptors), SVSIM_ERR_LOCK);
+  EXPECT_EQ(svsimWaveformLocked(array), 0);  // a failed Unlock still closes
+  EXPECT_EQ(svsimWaveformWrite(array, 0, &sample, 1), 0);
+  svsimReset();
+  EXPECT_EQ(svsimStrayWaveformUnlocks(), 0u);
   svsimDisposeWaveformArray(array);
 }
 
