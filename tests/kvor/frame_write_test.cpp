@@ -84,11 +84,16 @@ TEST_F(KvorFrameWrite, ASinkKeepsEveryWriteUncheckedAndSendsNothing) {
   const uint32_t reader = Create("CAN2", kvMode_FrameInStream);
   std::vector<uint8_t> bytes = Pack({{0x7, {1, 2}}}, true);
   bytes[15] = 40;  // a fixed record of 40 bytes, which a check refuses
+  EXPECT_EQ(kvsimLastWrite(writer, nullptr, 0), 0) << "nothing written yet";
   ASSERT_EQ(kvsimSetWriteSink(writer, 1), 0);
   ASSERT_EQ(kvWriteFrame(writer, bytes.data(), static_cast<uint32_t>(bytes.size()), 0.0), 0);
   std::vector<uint8_t> copy(bytes.size());
   EXPECT_EQ(kvsimLastWrite(writer, copy.data(), static_cast<uint32_t>(copy.size())), 24);
   EXPECT_EQ(copy, bytes);
+  uint8_t head[10] = {};
+  EXPECT_EQ(kvsimLastWrite(writer, head, 10), 24) << "a short buffer gets the start";
+  EXPECT_TRUE(std::equal(head, head + 10, bytes.begin()));
+  EXPECT_EQ(kvsimLastWrite(reader, copy.data(), 1), -1) << "an input session writes nothing";
   uint32_t pending = 1;
   ASSERT_EQ(kvGetProperty(reader, kvPropSession_NumPend, sizeof pending, &pending), 0);
   EXPECT_EQ(pending, 0u) << "a sink delivers nothing";
@@ -124,6 +129,16 @@ TEST_F(KvorFrameWrite, AnEthernetWriteIsRefusedWholeForAnyBadDescriptor) {
   EXPECT_EQ(copy[0], 1);
   EXPECT_EQ(copy[1], 2);
   EXPECT_EQ(kvsimLastEthernetWrite(writer, 3, copy.data(), 1600), -1);
+  // A descriptor without room takes the frame cut to nothing.
+  copy.assign(4, 0xEE);
+  EthernetSlot none = Room(copy.data(), 0);
+  int32_t returned = 0;
+  ASSERT_EQ(kvhdnReadFrameEthernet(reader, &none, 1, &returned, 0.0), 0);
+  ASSERT_EQ(returned, 1);
+  EXPECT_EQ(none.length, 0u);
+  EXPECT_EQ(none.flags, 0x8u) << "bit 3: cut";
+  EXPECT_EQ(none.wireLength, 1501u);
+  EXPECT_EQ(copy[0], 0xEE) << "nothing stored without room";
 }
 
 TEST_F(KvorFrameWrite, WithTheLogOffCallsWorkAndLeaveNoRecordUntilAReset) {

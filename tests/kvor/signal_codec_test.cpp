@@ -1,5 +1,6 @@
 // Signal values in payloads: every placement of both byte orders against an independent reading
-// of the payload as one integer, golden payloads, and the physical conversion at its edges.
+// of the payload as one integer, golden payloads, the physical conversion at its edges, and
+// multiplexing.
 #include "signal_codec.h"
 
 #include <gtest/gtest.h>
@@ -152,6 +153,27 @@ TEST(SignalCodec, PhysicalValuesConvertWithScaleOffsetAndLimits) {
     EXPECT_EQ(PhysicalToRaw(c.signal, c.physical), c.raw) << c.what;
     EXPECT_NEAR(RawToPhysical(c.signal, c.raw), c.back, 1e-9) << c.what;
   }
+}
+
+TEST(SignalCodec, OnlyTheSelectedMultiplexedSignalsArePresent) {
+  tFrame frame;
+  frame.payloadLength = 8;
+  tSignal mux = Layout(ByteOrder::kLittleEndian, 0, 3);
+  mux.mux = MuxRole::kMultiplexer;
+  tSignal plain = Layout(ByteOrder::kLittleEndian, 56, 8);
+  tSignal m2 = Layout(ByteOrder::kLittleEndian, 8, 8);
+  m2.mux = MuxRole::kMultiplexed;
+  m2.muxValue = 2;
+  frame.signals = {mux, plain, m2};
+  uint8_t payload[8] = {};
+  for (uint64_t selector : {0u, 2u, 5u}) {
+    InsertRaw(mux, selector, payload);
+    EXPECT_TRUE(SignalPresent(frame, frame.signals.front(), payload));
+    EXPECT_TRUE(SignalPresent(frame, plain, payload));
+    EXPECT_EQ(SignalPresent(frame, m2, payload), selector == 2) << selector;
+  }
+  frame.signals.pop_front();  // no multiplexer: no multiplexed signal is there
+  EXPECT_FALSE(SignalPresent(frame, m2, payload));
 }
 
 }  // namespace

@@ -257,6 +257,11 @@ TEST_F(KvorSignalDatabase, CallsCheckModesRegionsAndArguments) {
       {kvReadSignalSinglePoint(xyIn, values, 16, nullptr, 0), kvsimErrWrongMode},  // by name
   };
   for (size_t i = 0; i < std::size(cases); ++i) EXPECT_EQ(cases[i][0], cases[i][1]) << i;
+  // The made-up values of a fill go to input sessions only, and end when it is taken back.
+  EXPECT_EQ(kvsimSetSignalReadFill(xyOut, 1), -1);
+  ASSERT_EQ(kvsimSetSignalReadFill(xyIn, 2), 0);
+  ASSERT_EQ(kvsimSetSignalReadFill(xyIn, -1), 0);
+  EXPECT_TRUE(ReadPairs(xyIn, 2, 3).values[0].empty());
 }
 
 }  // namespace
