@@ -41,23 +41,36 @@ TEST(Multibyte, SevenBitTextPassesInTheCLocaleEvenWhenStrict) {
   }
 }
 
-TEST(Multibyte, StrictRefusesAnyRealConversion) {
-  cLocale locale("C.UTF-8");
-  ASSERT_TRUE(locale.Ok());
-  std::string output = "kept";
-  EXPECT_EQ(MultibyteToUtf8("caf\xC3\xA9", true, output), kvpath::kConversionStrict);
-  EXPECT_EQ(Utf8ToMultibyte("caf\xC3\xA9", true, output), kvpath::kConversionStrict);
-  EXPECT_EQ(output, "kept");
-}
-
-TEST(Multibyte, InvalidUtf8FailsBeforeTheStrictTest) {
-  cLocale locale("C.UTF-8");
-  ASSERT_TRUE(locale.Ok());
-  for (const char *bad : {"a\xC0\xAF", "\xED\xA0\x80", "x\xC3", "\xF4\x90\x80\x80"}) {
-    for (bool strict : {false, true}) {
-      std::string output;
-      EXPECT_EQ(Utf8ToMultibyte(bad, strict, output), kvpath::kConversionFailed) << bad;
-    }
+TEST(Multibyte, RefusalsLeaveTheOutputAlone) {
+  const auto kToUtf8 = &MultibyteToUtf8;
+  const auto kToMultibyte = &Utf8ToMultibyte;
+  const struct {
+    const char *locale;
+    int32_t (*convert)(const char *, bool, std::string &);
+    const char *text;
+    bool strict;
+    int32_t result;
+  } cases[] = {
+      // Strict refuses any real conversion.
+      {"C.UTF-8", kToUtf8, "caf\xC3\xA9", true, kvpath::kConversionStrict},
+      {"C.UTF-8", kToMultibyte, "caf\xC3\xA9", true, kvpath::kConversionStrict},
+      // Invalid UTF-8 fails before the strict test.
+      {"C.UTF-8", kToMultibyte, "a\xC0\xAF", false, kvpath::kConversionFailed},
+      {"C.UTF-8", kToMultibyte, "\xED\xA0\x80", true, kvpath::kConversionFailed},
+      {"C.UTF-8", kToMultibyte, "x\xC3", true, kvpath::kConversionFailed},
+      {"C.UTF-8", kToMultibyte, "\xF4\x90\x80\x80", false, kvpath::kConversionFailed},
+      // Non-ASCII has no form in the C locale.
+      {"C", kToUtf8, "caf\xC3\xA9", false, kvpath::kConversionFailed},
+      {"C", kToMultibyte, "caf\xC3\xA9", false, kvpath::kConversionFailed},
+  };
+  for (const auto &c : cases) {
+    SCOPED_TRACE(std::string(c.locale) + (c.convert == kToUtf8 ? " to UTF-8 " : " to multibyte ") +
+                 c.text + (c.strict ? " strict" : ""));
+    cLocale locale(c.locale);
+    ASSERT_TRUE(locale.Ok());
+    std::string output = "kept";
+    EXPECT_EQ(c.convert(c.text, c.strict, output), c.result);
+    EXPECT_EQ(output, "kept");
   }
 }
 
@@ -72,13 +85,6 @@ TEST(Multibyte, RoundTripInAUtf8LocaleForEveryLength) {
   std::string utf8;
   ASSERT_EQ(MultibyteToUtf8(multibyte.c_str(), false, utf8), 0);
   EXPECT_EQ(utf8, text);
-}
-
-TEST(Multibyte, NonAsciiHasNoFormInTheCLocale) {
-  cLocale locale("C");
-  std::string output = "kept";
-  EXPECT_EQ(MultibyteToUtf8("caf\xC3\xA9", false, output), kvpath::kConversionFailed);
-  EXPECT_EQ(Utf8ToMultibyte("caf\xC3\xA9", false, output), kvpath::kConversionFailed);
 }
 
 }  // namespace

@@ -54,59 +54,48 @@ TEST_F(PathExports, SizeIsLengthPlusOneForEachName) {
   EXPECT_TRUE(IsDirectory(dir_.Sub("cfg/kvor")));
 }
 
-TEST_F(PathExports, BufferOfExactSizeWorksAndOneLessIsRefusedUntouched) {
+TEST_F(PathExports, BufferOfExactSizeWorksOneLessIsRefusedUntouchedAndMoreIsFilledWithNul) {
   const std::string name = "eErrorLogDir";
+  const size_t length = std::strlen("/var/lib/kvor/log");
   uint64_t size = 0;
   ASSERT_EQ(SizeOf(name, &size), 0);
-  std::vector<char> buffer(size + 8, 'x');
+  std::vector<char> buffer(64, 'x');
   EXPECT_EQ(kvsvPathGetMultibyteString(name.data(), name.size(), size - 1, buffer.data()),
             kInternal);
   EXPECT_EQ(std::string(buffer.data(), buffer.size()), std::string(buffer.size(), 'x'));
   EXPECT_EQ(kvsvPathGetMultibyteString(name.data(), name.size(), size, buffer.data()), 0);
   EXPECT_STREQ(buffer.data(), "/var/lib/kvor/log");
   EXPECT_EQ(buffer[size], 'x') << "nothing beyond bufferSize is written";
-}
-
-TEST_F(PathExports, TheRestOfALargeBufferIsFilledWithNul) {
-  const std::string name = "eErrorLogDir";
-  std::vector<char> buffer(64, 'x');
   ASSERT_EQ(kvsvPathGetMultibyteString(name.data(), name.size(), buffer.size(), buffer.data()), 0);
-  for (size_t i = std::strlen("/var/lib/kvor/log"); i < buffer.size(); ++i) {
-    ASSERT_EQ(buffer[i], '\0') << i;
-  }
+  EXPECT_EQ(std::string(buffer.data() + length, buffer.size() - length),
+            std::string(buffer.size() - length, '\0'));
 }
 
-TEST_F(PathExports, OnlyNameLengthBytesAreRead) {
+TEST_F(PathExports, OnlyNameLengthBytesAreReadAndRefusedCallsTouchNothing) {
   const char text[] = "eErrorLogDirAndMore";
   uint64_t size = 0;
   EXPECT_EQ(kvsvPathGetMultibyteStringSizeInBytes(text, 12, &size), 0);
   EXPECT_EQ(size, std::strlen("/var/lib/kvor/log") + 1);
-  EXPECT_EQ(kvsvPathGetMultibyteStringSizeInBytes(text, 11, &size), kInternal);
-  EXPECT_EQ(kvsvPathGetMultibyteStringSizeInBytes(text, 19, &size), kInternal);
-}
-
-TEST_F(PathExports, UnknownAndEmptyNamesAreInternalErrors) {
-  for (const std::string &name : {std::string(), std::string("eerrorlogdir"),
-                                  std::string("eErrorLogDir "), std::string("kind3")}) {
-    uint64_t size = 99;
-    EXPECT_EQ(SizeOf(name, &size), kInternal) << name;
+  const struct {
+    const char *name;
+    size_t length;
+    kvsvStatus status;
+  } cases[] = {
+      {text, 11, kInternal},         {text, 19, kInternal},           {"", 0, kInternal},
+      {"eerrorlogdir", 12, kInternal}, {"eErrorLogDir ", 13, kInternal}, {"kind3", 5, kInternal},
+      {nullptr, 0, kInternal},       {nullptr, 3, kvErrNullArgument},
+  };
+  for (const auto &c : cases) {
+    SCOPED_TRACE(std::string(c.name != nullptr ? c.name : "null").substr(0, c.length));
+    size = 99;
+    EXPECT_EQ(kvsvPathGetMultibyteStringSizeInBytes(c.name, c.length, &size), c.status);
     EXPECT_EQ(size, 99u);
     char buffer[64] = "untouched";
-    EXPECT_EQ(kvsvPathGetMultibyteString(name.data(), name.size(), sizeof buffer, buffer),
-              kInternal);
+    EXPECT_EQ(kvsvPathGetMultibyteString(c.name, c.length, sizeof buffer, buffer), c.status);
     EXPECT_STREQ(buffer, "untouched");
   }
-  uint64_t size = 0;
-  EXPECT_EQ(kvsvPathGetMultibyteStringSizeInBytes(nullptr, 0, &size), kInternal);
-}
-
-TEST_F(PathExports, NullPointersGiveNullArgument) {
-  uint64_t size = 0;
-  char buffer[8];
-  EXPECT_EQ(kvsvPathGetMultibyteStringSizeInBytes("eErrorLogDir", 12, nullptr), kvErrNullArgument);
-  EXPECT_EQ(kvsvPathGetMultibyteStringSizeInBytes(nullptr, 12, &size), kvErrNullArgument);
-  EXPECT_EQ(kvsvPathGetMultibyteString("eErrorLogDir", 12, 64, nullptr), kvErrNullArgument);
-  EXPECT_EQ(kvsvPathGetMultibyteString(nullptr, 3, sizeof buffer, buffer), kvErrNullArgument);
+  EXPECT_EQ(kvsvPathGetMultibyteStringSizeInBytes(text, 12, nullptr), kvErrNullArgument);
+  EXPECT_EQ(kvsvPathGetMultibyteString(text, 12, 64, nullptr), kvErrNullArgument);
 }
 
 TEST_F(PathExports, AFileSystemFailureOnTheConfigurationKindsIsAnInternalError) {
@@ -126,40 +115,29 @@ TEST_F(PathExports, AFileSystemFailureOnTheConfigurationKindsIsAnInternalError) 
   EXPECT_EQ(size, dir_.Sub("good/kvor").size() + 1);
 }
 
-TEST_F(PathExports, HostStringReceivesTheText) {
-  SvHandle name = svsimMakeString("eDatabaseCacheDir");
+TEST_F(PathExports, HostStringReceivesTheTextOrStaysAsItWas) {
   SvHandle text = svsimMakeString("old");
-  ASSERT_NE(name, nullptr);
   ASSERT_NE(text, nullptr);
+  // The name as a host string: none, empty, of the wrong case, and one that the host cannot store.
+  const struct {
+    const char *name;  // null: no handle
+    bool failAll;
+  } refused[] = {{nullptr, false}, {"", false}, {"eerrorlogdir", false}, {"eErrorLogDir", true}};
+  for (const auto &c : refused) {
+    SCOPED_TRACE(c.name != nullptr ? c.name : "null");
+    SvHandle name = c.name != nullptr ? svsimMakeString(c.name) : nullptr;
+    svsimFailAll(c.failAll ? 1 : 0);
+    EXPECT_EQ(kvsvGetPathMultibyteStringAsSvStr(name, text), kInternal);
+    svsimFailAll(0);
+    EXPECT_EQ(svsimInjectedFaults() > 0, c.failAll);
+    if (!c.failAll) {
+      EXPECT_EQ(ReadHostString(text), "old");
+    }
+    if (name != nullptr) svDisposeHandle(name);
+  }
+  SvHandle name = svsimMakeString("eDatabaseCacheDir");
   EXPECT_EQ(kvsvGetPathMultibyteStringAsSvStr(name, text), 0);
   EXPECT_EQ(ReadHostString(text), "/var/lib/kvor/dbCache");
-  svDisposeHandle(name);
-  svDisposeHandle(text);
-}
-
-TEST_F(PathExports, HostStringNameFailures) {
-  SvHandle text = svsimMakeString("old");
-  ASSERT_NE(text, nullptr);
-  EXPECT_EQ(kvsvGetPathMultibyteStringAsSvStr(nullptr, text), kInternal);
-  SvHandle empty = svsimMakeString("");
-  EXPECT_EQ(kvsvGetPathMultibyteStringAsSvStr(empty, text), kInternal);
-  SvHandle lower = svsimMakeString("eerrorlogdir");
-  EXPECT_EQ(kvsvGetPathMultibyteStringAsSvStr(lower, text), kInternal);
-  EXPECT_EQ(ReadHostString(text), "old");
-  svDisposeHandle(empty);
-  svDisposeHandle(lower);
-  svDisposeHandle(text);
-}
-
-TEST_F(PathExports, AHostStringThatCannotBeStoredIsAnInternalError) {
-  SvHandle name = svsimMakeString("eErrorLogDir");
-  SvHandle text = svsimMakeString("old");
-  ASSERT_NE(name, nullptr);
-  ASSERT_NE(text, nullptr);
-  svsimFailAll(1);
-  EXPECT_EQ(kvsvGetPathMultibyteStringAsSvStr(name, text), kInternal);
-  svsimFailAll(0);
-  EXPECT_GT(svsimInjectedFaults(), 0u);
   svDisposeHandle(name);
   svDisposeHandle(text);
 }

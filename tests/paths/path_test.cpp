@@ -6,6 +6,7 @@
 #include <clocale>
 #include <cstring>
 #include <string>
+#include <vector>
 
 #include "core/exception_base.h"
 #include "diagnostics/overr_exception.h"
@@ -73,35 +74,27 @@ TEST_F(PathKinds, EachKindWithTheDefaults) {
   for (const auto &c : cases) EXPECT_EQ(PathOf(c.first), c.second) << "kind " << c.first;
 }
 
-TEST_F(PathKinds, KindsTwoAndFourteenMakeTheirDirectoryWithParents) {
+TEST_F(PathKinds, OnlyKindsTwoAndFourteenMakeTheirDirectoryWithParents) {
   cScopedEnv xdg("XDG_CONFIG_HOME", dir_.Sub("deep/er/config/"));
-  EXPECT_EQ(PathOf(2), dir_.Sub("deep/er/config/kvor"));
-  EXPECT_TRUE(IsDirectory(dir_.Sub("deep/er/config/kvor")));
-  std::filesystem::remove_all(dir_.Sub("deep"));
-  EXPECT_EQ(PathOf(14), dir_.Sub("deep/er/config/kvor"));
-  EXPECT_TRUE(IsDirectory(dir_.Sub("deep/er/config/kvor")));
+  for (uint32_t kind = 0; kind < 17; ++kind) {
+    if (kind != 2 && kind != 14) PathOf(kind);
+  }
+  EXPECT_FALSE(IsDirectory(dir_.Sub("deep")));
+  for (uint32_t kind : {2u, 14u}) {
+    EXPECT_EQ(PathOf(kind), dir_.Sub("deep/er/config/kvor")) << kind;
+    EXPECT_TRUE(IsDirectory(dir_.Sub("deep/er/config/kvor"))) << kind;
+    std::filesystem::remove_all(dir_.Sub("deep"));
+  }
 }
 
-TEST_F(PathKinds, AFileSystemFailureBecomesLine59WithItsCode) {
-  dir_.WriteFile("file", "x");
-  cScopedEnv xdg("XDG_CONFIG_HOME", dir_.Sub("file"));
-  kvpath::cSysqWrapper sysq;
-  ExpectThrowAt([&] { cPath path(2, sysq); }, 22, 1, 59, 3, static_cast<uint32_t>(-52008));
-}
-
-TEST_F(PathKinds, NoKindFromSeventeenOn) {
+TEST_F(PathKinds, FileSystemFailuresAndKindsFromSeventeenOnThrow) {
   kvpath::cSysqWrapper sysq;
   for (uint32_t kind : {17u, 18u, 0xFFFFFFFFu}) {
     ExpectThrowAt([&] { cPath path(kind, sysq); }, 22, 1, 154, 2, 1);
   }
-}
-
-TEST_F(PathKinds, OnlyKindsTwoAndFourteenTouchTheFileSystem) {
-  for (uint32_t kind = 0; kind < 17; ++kind) {
-    if (kind == 2 || kind == 14) continue;
-    PathOf(kind);
-  }
-  EXPECT_FALSE(IsDirectory(dir_.Sub("config")));
+  dir_.WriteFile("file", "x");
+  cScopedEnv xdg("XDG_CONFIG_HOME", dir_.Sub("file"));
+  ExpectThrowAt([&] { cPath path(2, sysq); }, 22, 1, 59, 3, static_cast<uint32_t>(-52008));
 }
 
 TEST_F(PathKinds, AnEmptyFirstComponentLetsTheNextStartThePath) {
@@ -122,28 +115,24 @@ class PathAppend : public ::testing::Test {
 };
 
 TEST_F(PathAppend, JoiningRules) {
-  const std::pair<std::string, std::string> cases[] = {
-      {"a", "/home/svuser/a"},
-      {"a/", "/home/svuser/a"},
-      {"  a", "/home/svuser/a"},
-      {"a b \n", "/home/svuser/a b"},
-      {"/abs//", "/home/svuser//abs"},
-      {"caf\xC3\xA9", "/home/svuser/caf\xC3\xA9"},
-      {"", "/home/svuser/"},
+  const std::pair<std::vector<std::string>, std::string> cases[] = {
+      {{"a"}, "/home/svuser/a"},
+      {{"a/"}, "/home/svuser/a"},
+      {{"  a"}, "/home/svuser/a"},
+      {{"a b \n"}, "/home/svuser/a b"},
+      {{"/abs//"}, "/home/svuser//abs"},
+      {{"caf\xC3\xA9"}, "/home/svuser/caf\xC3\xA9"},
+      {{""}, "/home/svuser/"},
+      // Trailing slashes on both sides join with one; the stored path keeps a trailing slash of
+      // its last component only until the next append.
+      {{"dir/", "sub/"}, "/home/svuser/dir/sub"},
+      {{"dir/", "sub/", "x"}, "/home/svuser/dir/sub/x"},
   };
   for (const auto &c : cases) {
     cPath path(16, sysq_);
-    EXPECT_EQ(path.AppendUtf8(c.first).GetUtf8(), c.second) << "component [" << c.first << "]";
+    for (const std::string &component : c.first) path.AppendUtf8(component);
+    EXPECT_EQ(path.GetUtf8(), c.second) << "components [" << c.first.front() << "]...";
   }
-}
-
-TEST_F(PathAppend, TrailingSlashesOnBothSidesJoinWithOne) {
-  cPath path(16, sysq_);
-  path.AppendUtf8("dir/").AppendUtf8("sub/");
-  EXPECT_EQ(path.GetUtf8(), "/home/svuser/dir/sub");
-  // The stored path keeps a trailing slash of its last component only until the next append.
-  path.AppendUtf8("x");
-  EXPECT_EQ(path.GetUtf8(), "/home/svuser/dir/sub/x");
 }
 
 TEST_F(PathAppend, InvalidUtf8ThrowsWhereverItStandsAndChangesNothing) {
@@ -174,20 +163,19 @@ TEST_F(PathAppend, CopyNeedsRoomForTheNul) {
   }
 }
 
-TEST_F(PathAppend, MultibyteInAUtf8Locale) {
-  ASSERT_NE(std::setlocale(LC_ALL, "C.UTF-8"), nullptr);
-  cPath path(16, sysq_);
-  path.AppendMultibyte("m\xC3\xBCnchen/");
-  EXPECT_EQ(path.GetUtf8(), "/home/svuser/m\xC3\xBCnchen");
-  EXPECT_EQ(path.GetMultibyte(), "/home/svuser/m\xC3\xBCnchen");
+TEST_F(PathAppend, MultibyteAppendsInAUtf8AndInTheCLocale) {
+  const struct {
+    const char *locale, *component, *path;
+  } cases[] = {{"C.UTF-8", "m\xC3\xBCnchen/", "/home/svuser/m\xC3\xBCnchen"},
+               {"C", " plain/", "/home/svuser/plain"}};
+  for (const auto &c : cases) {
+    ASSERT_NE(std::setlocale(LC_ALL, c.locale), nullptr);
+    cPath path(16, sysq_);
+    path.AppendMultibyte(c.component);
+    EXPECT_EQ(path.GetUtf8(), c.path) << c.locale;
+    EXPECT_EQ(path.GetMultibyte(), c.path) << c.locale;
+  }
   std::setlocale(LC_ALL, "C");
-}
-
-TEST_F(PathAppend, AsciiPassesTheConversionsInTheCLocale) {
-  std::setlocale(LC_ALL, "C");
-  cPath path(16, sysq_);
-  path.AppendMultibyte(" plain/");
-  EXPECT_EQ(path.GetMultibyte(), "/home/svuser/plain");
 }
 
 TEST_F(PathAppend, ConversionFailuresThrowTheInHouseException) {

@@ -62,17 +62,11 @@ TEST(SysqWrapper, FixedDirectories) {
 
 TEST(SysqWrapper, TempDirFromTmpdirAsItStands) {
   kvpath::cSysqWrapper sysq;
-  {
-    cScopedEnv tmp("TMPDIR", std::nullopt);
-    EXPECT_EQ(sysq.GetTempDir(), "/tmp");
-  }
-  {
-    cScopedEnv tmp("TMPDIR", std::string("/scratch/t"));
-    EXPECT_EQ(sysq.GetTempDir(), "/scratch/t");
-  }
-  {
-    cScopedEnv tmp("TMPDIR", std::string("/scratch/t/"));
-    EXPECT_EQ(sysq.GetTempDir(), "/scratch/t/");
+  const std::pair<std::optional<std::string>, std::string> cases[] = {
+      {std::nullopt, "/tmp"}, {"/scratch/t", "/scratch/t"}, {"/scratch/t/", "/scratch/t/"}};
+  for (const auto &c : cases) {
+    cScopedEnv tmp("TMPDIR", c.first);
+    EXPECT_EQ(sysq.GetTempDir(), c.second);
   }
 }
 
@@ -123,12 +117,24 @@ class UserConfigDir : public ::testing::Test {
   kvpath::cSysqWrapper sysq_;
 };
 
-TEST_F(UserConfigDir, XdgValueWithoutSlashAndWithoutConfigSuffix) {
-  for (const char *suffix : {"", "/", "//\n"}) {
-    cScopedEnv xdg("XDG_CONFIG_HOME", dir_.Sub("conf") + suffix);
-    EXPECT_EQ(sysq_.GetUserConfigDir(false), dir_.Sub("conf"));
+TEST_F(UserConfigDir, XdgLosesItsSlashesAndHomeGetsOneSlashAndConfig) {
+  const struct {
+    const char *variable;
+    std::string value, dir;
+  } cases[] = {
+      {"XDG_CONFIG_HOME", dir_.Sub("conf"), dir_.Sub("conf")},
+      {"XDG_CONFIG_HOME", dir_.Sub("conf/"), dir_.Sub("conf")},
+      {"XDG_CONFIG_HOME", dir_.Sub("conf//\n"), dir_.Sub("conf")},
+      {"HOME", dir_.Path(), dir_.Sub(".config")},
+      {"HOME", dir_.Path() + "/", dir_.Sub(".config")},
+      {"HOME", dir_.Path() + "// ", dir_.Sub(".config")},
+  };
+  for (const auto &c : cases) {
+    cScopedEnv variable(c.variable, c.value);
+    EXPECT_EQ(sysq_.GetUserConfigDir(false), c.dir) << c.variable << "=" << c.value;
   }
   EXPECT_FALSE(IsDirectory(dir_.Sub("conf"))) << "create false makes nothing";
+  EXPECT_FALSE(IsDirectory(dir_.Sub(".config"))) << "create false makes nothing";
 }
 
 TEST_F(UserConfigDir, XdgCreateMakesParents) {
@@ -136,13 +142,6 @@ TEST_F(UserConfigDir, XdgCreateMakesParents) {
   EXPECT_EQ(sysq_.GetUserConfigDir(true), dir_.Sub("a/b/c"));
   EXPECT_TRUE(IsDirectory(dir_.Sub("a/b/c")));
   EXPECT_EQ(sysq_.GetUserConfigDir(true), dir_.Sub("a/b/c")) << "an existing one is fine";
-}
-
-TEST_F(UserConfigDir, HomeGetsOneSlashAndConfig) {
-  for (const char *suffix : {"", "/", "// "}) {
-    cScopedEnv home("HOME", dir_.Path() + suffix);
-    EXPECT_EQ(sysq_.GetUserConfigDir(false), dir_.Sub(".config"));
-  }
 }
 
 TEST_F(UserConfigDir, HomeCreateMakesOnlyTheLastDirectory) {
