@@ -164,17 +164,6 @@ TEST_F(ErrorLogFile, AHandEditedLimitOfFiveWrapsAndLeavesLaterRowsInPlace) {
   EXPECT_EQ(Line(wrapped, 11).substr(83, 11), "        104");
 }
 
-TEST_F(ErrorLogFile, TheThousandAndFirstRowOverwritesTheFirst) {
-  cErrorLog log(kVersion, Base().c_str());
-  WriteError(log, 1);
-  WriteAt(File(), 13, "1000");
-  WriteError(log, 2);
-  const std::string file = ReadFile(File());
-  EXPECT_EQ(file.substr(13, 4), "0001");
-  EXPECT_EQ(Line(file, 7).substr(0, 10), "0001      ");
-  EXPECT_EQ(Line(file, 7).substr(83, 11), "          2");
-}
-
 TEST_F(ErrorLogFile, RowNumbersAboveNineThousandNineHundredNinetyNineWiden) {
   { cErrorLog create(kVersion, Base().c_str()); }
   WriteAt(File(), 37, "20000 ");
@@ -263,7 +252,12 @@ TEST_F(ErrorLogFile, VersionLinesBeyondAThousandAreDropped) {
   EXPECT_EQ(Line(file, 1006).substr(0, 4), "0001");
 }
 
-TEST_F(ErrorLogFile, AFileThatCannotBeWrittenDropsTheRow) {
+TEST_F(ErrorLogFile, ANullNameOrAFileThatCannotBeWrittenDropsTheRow) {
+  cErrorLog off(kVersion, nullptr);
+  EXPECT_STREQ(off.Path(), "");
+  WriteError(off, 1);
+  EXPECT_TRUE(ReadFile(File()).empty());
+
   const std::string missing = dir_.Path() + "/no/such/dir/kvorErr.log";
   cErrorLog absent(kVersion, missing.c_str());
   WriteError(absent, 1);
@@ -275,13 +269,6 @@ TEST_F(ErrorLogFile, AFileThatCannotBeWrittenDropsTheRow) {
   cErrorLog readOnly(kVersion, (locked + "/kvorErr.log").c_str());
   WriteError(readOnly, 1);
   EXPECT_EQ(access((locked + "/kvorErr_" + kProgram + ".log").c_str(), F_OK), -1);
-}
-
-TEST_F(ErrorLogFile, ANullNameSwitchesTheLogOff) {
-  cErrorLog log(kVersion, nullptr);
-  EXPECT_STREQ(log.Path(), "");
-  WriteError(log, 1);
-  EXPECT_TRUE(ReadFile(File()).empty());
 }
 
 TEST(ErrorLogName, TheProgramsNameGoesBeforeTheLastDot) {

@@ -38,7 +38,7 @@ TEST(Ovdynlib, LoadsALibraryAndFindsASymbol) {
   ovdynlib_close(library);
 }
 
-TEST(Ovdynlib, AMissingLibraryIsDescribed) {
+TEST(Ovdynlib, AMissingLibraryOrSymbolIsDescribed) {
   tJsonStatus status;
   EXPECT_EQ(ovdynlib_load("libkvsv-no-such-library.so.9", kLoadNowGlobal, status), nullptr);
   EXPECT_EQ(status.code, -52005);
@@ -60,41 +60,36 @@ TEST(Ovdynlib, AMissingLibraryIsDescribed) {
   EXPECT_LT(text.find("\"component\""), text.find("\"ovdynlib_debug\""));
   EXPECT_LT(text.find("\"ovdynlib_debug\""), text.find("\"internal_error\""));
   ReleaseJsonStatus(status);
-}
 
-TEST(Ovdynlib, AMissingSymbolIsDescribedWithTheLoadersDebugText) {
-  tJsonStatus status;
-  void *library = ovdynlib_load("libm.so.6", kLoadNowGlobal, status);
+  tJsonStatus symbol;
+  void *library = ovdynlib_load("libm.so.6", kLoadNowGlobal, symbol);
   ASSERT_NE(library, nullptr);
-  EXPECT_EQ(ovdynlib_symbol(library, "kvsv_no_such_symbol", status), nullptr);
-  EXPECT_EQ(status.code, -52005);
-  EXPECT_EQ(Member(status.buffer, "line"), "185");
-  const char *debug = jsonz::JsonFindKey(status.buffer, "ovdynlib_debug");
+  EXPECT_EQ(ovdynlib_symbol(library, "kvsv_no_such_symbol", symbol), nullptr);
+  EXPECT_EQ(symbol.code, -52005);
+  EXPECT_EQ(Member(symbol.buffer, "line"), "185");
+  debug = jsonz::JsonFindKey(symbol.buffer, "ovdynlib_debug");
   EXPECT_EQ(Member(debug, "debug"), "failed to ovdynlib_load library");
   EXPECT_EQ(Member(debug, "ovdynlib_symbol"), "kvsv_no_such_symbol");
   EXPECT_EQ(Member(debug, "path"), "<absent>");
-  const char *internal = jsonz::JsonFindKey(status.buffer, "internal_error");
+  internal = jsonz::JsonFindKey(symbol.buffer, "internal_error");
   EXPECT_NE(Member(internal, "string").find("kvsv_no_such_symbol"), std::string::npos);
   ovdynlib_close(library);
-  ReleaseJsonStatus(status);
+  ReleaseJsonStatus(symbol);
 }
 
-TEST(Ovdynlib, AnEarlierErrorStopsBothAndStays) {
-  tJsonStatus status;
-  status.code = -7;
-  EXPECT_EQ(ovdynlib_load("libm.so.6", kLoadNowGlobal, status), nullptr);
-  EXPECT_EQ(ovdynlib_symbol(RTLD_DEFAULT, "cos", status), nullptr);
-  EXPECT_EQ(status.code, -7);
-  EXPECT_EQ(status.buffer, nullptr);
-}
-
-TEST(Ovdynlib, AnEarlierWarningGivesWayToTheFailure) {
-  tJsonStatus status;
-  status.code = 4;
-  EXPECT_EQ(ovdynlib_load("libkvsv-no-such-library.so.9", kLoadNowGlobal, status), nullptr);
-  EXPECT_EQ(status.code, -52005);
-  EXPECT_EQ(Member(status.buffer, "line"), "110");
-  ReleaseJsonStatus(status);
+TEST(Ovdynlib, AnEarlierErrorStopsBothAndStaysAnEarlierWarningGivesWay) {
+  tJsonStatus failed;
+  failed.code = -7;
+  EXPECT_EQ(ovdynlib_load("libm.so.6", kLoadNowGlobal, failed), nullptr);
+  EXPECT_EQ(ovdynlib_symbol(RTLD_DEFAULT, "cos", failed), nullptr);
+  EXPECT_EQ(failed.code, -7);
+  EXPECT_EQ(failed.buffer, nullptr);
+  tJsonStatus warned;
+  warned.code = 4;
+  EXPECT_EQ(ovdynlib_load("libkvsv-no-such-library.so.9", kLoadNowGlobal, warned), nullptr);
+  EXPECT_EQ(warned.code, -52005);
+  EXPECT_EQ(Member(warned.buffer, "line"), "110");
+  ReleaseJsonStatus(warned);
 }
 
 }  // namespace
