@@ -188,40 +188,43 @@ TEST_F(HostHandles, GrowHandleArrayMakesANewArrayWithTheMargin) {
     EXPECT_EQ(free, static_cast<char *>(*array) + 8) << c.extra;
     DisposeHandle(&array);
   }
+  // The host refuses the new array: nothing is made and no capacity claimed.
+  SvHandle array = nullptr;
+  uint32_t capacity = 0xDEAD;
+  svsimFailAllocAt(1);
+  EXPECT_EQ(GrowHandleArray(&array, 3, &capacity), nullptr);
+  EXPECT_EQ(array, nullptr);
+  EXPECT_EQ(capacity, 0u);
 }
 
-TEST_F(HostHandles, GrowHandleArrayWithRoomEnoughAsksTheHostNothing) {
-  SvHandle array = MakeArray(30, 5);
-  svsimResetCounters();
-  uint32_t capacity = 0;
-  // 5 + 20 free places are wanted, 25 are there.
-  void *free = GrowHandleArray(&array, 5, &capacity);
-  EXPECT_EQ(svsimResizeCount(), 0u);
-  EXPECT_EQ(svsimAllocCount(), 0u);
-  EXPECT_EQ(capacity, 30u);
-  EXPECT_EQ(free, static_cast<char *>(*array) + 8 + 5 * 8);
-  EXPECT_EQ(ArrayCount(array), 5);
-  EXPECT_EQ(GrowHandleArray(&array, 5, nullptr), free);
-  DisposeHandle(&array);
-}
-
-TEST_F(HostHandles, GrowHandleArrayGrowsByTheRequestAndTheMargin) {
-  for (int32_t move : {0, 1}) {
-    svsimSetMoveOnResize(move);
-    SvHandle array = MakeArray(30, 6);
-    svsimResetCounters();
-    uint32_t capacity = 0;
-    // 5 + 20 are wanted, 24 are free: the handle grows by 25 elements.
-    void *free = GrowHandleArray(&array, 5, &capacity);
-    EXPECT_EQ(svsimResizeCount(), 1u) << move;
-    EXPECT_EQ(capacity, 55u) << move;
-    EXPECT_EQ(svGetHandleSize(array), 8u + 55 * 8) << move;
-    // The address is in the block as it is after the resize, moved or not.
-    EXPECT_EQ(free, static_cast<char *>(*array) + 8 + 6 * 8) << move;
-    EXPECT_EQ(ArrayCount(array), 6) << move;
-    EXPECT_EQ(ArrayData8<uint64_t>(array)[5], 6u) << move;
-    EXPECT_EQ(ArrayData8<uint64_t>(array)[6], 0u) << move;
-    DisposeHandle(&array);
+TEST_F(HostHandles, GrowHandleArrayKeepsRoomForTheRequestAndTheMargin) {
+  const struct {
+    int32_t count;
+    uint32_t resizes, capacity;
+  } cases[] = {
+      {5, 0, 30},  // 5 + 20 free places are wanted, 25 are there: the host is asked nothing
+      {6, 1, 55},  // 24 are there: the handle grows by 5 + 20
+  };
+  for (const auto &c : cases) {
+    for (int32_t move : {0, 1}) {
+      SCOPED_TRACE(testing::Message() << c.count << " " << move);
+      svsimSetMoveOnResize(move);
+      SvHandle array = MakeArray(30, c.count);
+      svsimResetCounters();
+      uint32_t capacity = 0;
+      void *free = GrowHandleArray(&array, 5, &capacity);
+      EXPECT_EQ(svsimResizeCount(), c.resizes);
+      EXPECT_EQ(svsimAllocCount(), 0u);
+      EXPECT_EQ(capacity, c.capacity);
+      EXPECT_EQ(svGetHandleSize(array), 8u + c.capacity * 8);
+      // The address is in the block as it is after the resize, moved or not.
+      EXPECT_EQ(free, static_cast<char *>(*array) + 8 + c.count * 8);
+      EXPECT_EQ(ArrayCount(array), c.count);
+      EXPECT_EQ(ArrayData8<uint64_t>(array)[c.count - 1], static_cast<uint64_t>(c.count));
+      EXPECT_EQ(ArrayData8<uint64_t>(array)[c.count], 0u);
+      EXPECT_EQ(GrowHandleArray(&array, 5, nullptr), free);
+      DisposeHandle(&array);
+    }
   }
 }
 
@@ -246,15 +249,6 @@ TEST_F(HostHandles, GrowHandleArrayFailsOnlyOnANegativeResizeResult) {
   EXPECT_EQ(capacity, 4u + 21);
   EXPECT_EQ(svsimInjectedFaults(), 2u);
   DisposeHandle(&array);
-}
-
-TEST_F(HostHandles, GrowHandleArrayFailsWhenTheNewArrayCannotBeMade) {
-  SvHandle array = nullptr;
-  uint32_t capacity = 0xDEAD;
-  svsimFailAllocAt(1);
-  EXPECT_EQ(GrowHandleArray(&array, 3, &capacity), nullptr);
-  EXPECT_EQ(array, nullptr);
-  EXPECT_EQ(capacity, 0u);
 }
 
 TEST_F(HostHandles, DisposeHandleArrayFreesEveryElementThenTheArray) {
@@ -349,19 +343,6 @@ TEST_F(HostHandles, CommaListSplitsWithoutTrimming) {
   }
 }
 
-TEST_F(HostHandles, CommaListGoesOnPastAStringThatCannotBeMade) {
-  char text[] = "A,B,C";
-  SvHandle array = nullptr;
-  // The array is the first allocation, "A" the second, "B" the third.
-  svsimFailAllocAt(3);
-  EXPECT_EQ(CommaListToStringArray(text, &array, 0), 0);
-  ASSERT_EQ(ArrayCount(array), 3);
-  EXPECT_EQ(Text(ArrayData8<SvHandle>(array)[0]), "A");
-  EXPECT_EQ(ArrayData8<SvHandle>(array)[1], nullptr);
-  EXPECT_EQ(Text(ArrayData8<SvHandle>(array)[2]), "C");
-  DisposeHandleArray(&array);
-}
-
 TEST_F(HostHandles, CommaListFailsWhenTheArrayCannotBeMade) {
   for (int32_t mode : {0, 2}) {
     char text[] = "A,B";
@@ -388,16 +369,28 @@ TEST_F(HostHandles, CommaListAppendsNamedVariantsInMode2) {
   svsimDisposeVariantArray(array);
 }
 
-TEST_F(HostHandles, CommaListInMode2LeavesAVariantUnnamedWhenItsStringCannotBeMade) {
-  SvHandle array = nullptr;
-  char text[] = "A,B";
-  // The array is the first allocation, "A" the second.
-  svsimFailAllocAt(2);
-  EXPECT_EQ(CommaListToStringArray(text, &array, 2), 0);
-  ASSERT_EQ(ArrayCount(array), 2);
-  EXPECT_EQ(Name(array, 0), "<none>");
-  EXPECT_EQ(Name(array, 1), "B");
-  svsimDisposeVariantArray(array);
+TEST_F(HostHandles, CommaListGoesOnPastAStringThatCannotBeMade) {
+  for (int32_t mode : {0, 2}) {
+    SCOPED_TRACE(mode);
+    char text[] = "A,B,C";
+    SvHandle array = nullptr;
+    // The array is the first allocation, "A" the second, "B" the third.
+    svsimFailAllocAt(3);
+    EXPECT_EQ(CommaListToStringArray(text, &array, mode), 0);
+    ASSERT_EQ(ArrayCount(array), 3);
+    if (mode == 0) {
+      EXPECT_EQ(Text(ArrayData8<SvHandle>(array)[0]), "A");
+      EXPECT_EQ(ArrayData8<SvHandle>(array)[1], nullptr);
+      EXPECT_EQ(Text(ArrayData8<SvHandle>(array)[2]), "C");
+      DisposeHandleArray(&array);
+    } else {
+      // The variant is there, without a name.
+      EXPECT_EQ(Name(array, 0), "A");
+      EXPECT_EQ(Name(array, 1), "<none>");
+      EXPECT_EQ(Name(array, 2), "C");
+      svsimDisposeVariantArray(array);
+    }
+  }
 }
 
 TEST_F(HostHandles, CommaListInAnUnknownModeIsAnInternalError) {

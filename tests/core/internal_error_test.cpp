@@ -49,38 +49,35 @@ TEST(ReportInternalError, BuildsTheLogOnlyAtTheFirstReport) {
   for (uint32_t i = 0; i < 3; ++i) EXPECT_EQ(records[i].value.Line(), i + 1);
 }
 
-struct tBuildCase {
-  const char *name;
-  eBuild build;
-  bool logged;  // whether the failed build's report is written nonetheless
-};
+TEST(ReportInternalError, WhenTheBuildFailsReturnsInternalAndTheNextReportBuildsAgain) {
+  const struct {
+    const char *name;
+    eBuild build;
+    bool logged;  // whether the failed build's report is written nonetheless
+  } cases[] = {
+      {"standard exception", eBuild::kThrowStandard, false},
+      {"foreign exception", eBuild::kThrowOther, false},
+      {"negative code", eBuild::kNegativeCode, false},
+      // A warning left by the builder is not a failure: the log counts as built.
+      {"positive code", eBuild::kPositiveCode, true},
+  };
+  for (const auto &c : cases) {
+    SCOPED_TRACE(c.name);
+    cFakeErrorLog log;
+    log.SetBuild(c.build);
+    EXPECT_EQ(ReportInternalError(13, 10, 100, 7), kvErrInternal);
+    EXPECT_EQ(log.Builds(), 1);
+    EXPECT_EQ(log.Records().size(), c.logged ? 1u : 0u);
 
-class ReportWhenTheBuildFails : public testing::TestWithParam<tBuildCase> {};
-
-TEST_P(ReportWhenTheBuildFails, ReturnsInternalAndTheNextReportBuildsAgain) {
-  cFakeErrorLog log;
-  log.SetBuild(GetParam().build);
-  EXPECT_EQ(ReportInternalError(13, 10, 100, 7), kvErrInternal);
-  EXPECT_EQ(log.Builds(), 1);
-  EXPECT_EQ(log.Records().size(), GetParam().logged ? 1u : 0u);
-
-  log.SetBuild(eBuild::kSucceed);
-  EXPECT_EQ(ReportInternalError(13, 10, 101, 8), kvErrInternal);
-  EXPECT_EQ(log.Builds(), GetParam().logged ? 1 : 2);
-  const auto records = log.Records();
-  ASSERT_FALSE(records.empty());
-  EXPECT_EQ(records.back().value.Line(), 101u);
-  EXPECT_EQ(records.back().value.info, 8u);
+    log.SetBuild(eBuild::kSucceed);
+    EXPECT_EQ(ReportInternalError(13, 10, 101, 8), kvErrInternal);
+    EXPECT_EQ(log.Builds(), c.logged ? 1 : 2);
+    const auto records = log.Records();
+    ASSERT_FALSE(records.empty());
+    EXPECT_EQ(records.back().value.Line(), 101u);
+    EXPECT_EQ(records.back().value.info, 8u);
+  }
 }
-
-INSTANTIATE_TEST_SUITE_P(
-    Builds, ReportWhenTheBuildFails,
-    testing::Values(tBuildCase{"StandardException", eBuild::kThrowStandard, false},
-                    tBuildCase{"ForeignException", eBuild::kThrowOther, false},
-                    tBuildCase{"NegativeCode", eBuild::kNegativeCode, false},
-                    // A warning left by the builder is not a failure: the log counts as built.
-                    tBuildCase{"PositiveCode", eBuild::kPositiveCode, true}),
-    [](const testing::TestParamInfo<tBuildCase> &info) { return info.param.name; });
 
 TEST(ReportInternalError, NoRecordWhenTheLogObjectIsAbsentAndNoRebuild) {
   cFakeErrorLog log;

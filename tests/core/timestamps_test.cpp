@@ -153,45 +153,26 @@ unsigned __int128 Distance(const SvTime &a, const SvTime &b) {
 constexpr int kSamples = 200000;
 
 TEST(RawTime, RoundTripIsExactOutsideTheShiftedRelativeRange) {
+  const struct {
+    uint64_t low, high, shift;
+  } ranges[] = {
+      {1, 23037047999999999, 0},
+      {kRawRelativeLimit + 1, kOnes, 0},
+      // Relative values whose seconds reach the boundary are read back as absolute: shifted by
+      // the epoch, the same instant that an absolute time of those seconds stands for.
+      {23037048000000000, kRawRelativeLimit, kRawShift},
+  };
   std::mt19937_64 random(1601);
-  std::uniform_int_distribution<uint64_t> relative(1, 23037047999999999);
-  std::uniform_int_distribution<uint64_t> absolute(kRawRelativeLimit + 1, kOnes);
-  for (int i = 0; i < kSamples; ++i) {
-    for (uint64_t raw : {relative(random), absolute(random)}) {
+  for (const auto &r : ranges) {
+    std::uniform_int_distribution<uint64_t> values(r.low, r.high);
+    for (int i = 0; i < kSamples; ++i) {
+      const uint64_t raw = values(random);
       SvTime t;
       RawTimeToSvTime(&t, &raw);
       uint64_t back = 0;
       SvTimeToRawTime(&back, &t);
-      ASSERT_EQ(back, raw);
+      ASSERT_EQ(back, raw + r.shift) << raw;
     }
-  }
-}
-
-TEST(RawTime, LongRelativeTimesComeBackAsAbsoluteTimes) {
-  // Relative values whose seconds reach the boundary are read back as absolute: shifted by the
-  // epoch, the same instant that an absolute time of those seconds stands for.
-  std::mt19937_64 random(1976);
-  std::uniform_int_distribution<uint64_t> longRelative(23037048000000000, kRawRelativeLimit);
-  for (int i = 0; i < kSamples; ++i) {
-    const uint64_t raw = longRelative(random);
-    SvTime t;
-    RawTimeToSvTime(&t, &raw);
-    uint64_t back = 0;
-    SvTimeToRawTime(&back, &t);
-    ASSERT_EQ(back, raw + kRawShift);
-  }
-}
-
-TEST(RawTime, SvTimeComesBackWithinHalfA100nsStep) {
-  std::mt19937_64 random(1904);
-  std::uniform_int_distribution<int64_t> seconds(0, 1000000000000);
-  for (int i = 0; i < kSamples; ++i) {
-    const SvTime t{random(), seconds(random)};
-    uint64_t raw = 0;
-    SvTimeToRawTime(&raw, &t);
-    SvTime back;
-    RawTimeToSvTime(&back, &raw);
-    ASSERT_LE(Distance(t, back), kRawHalf + 1) << t.seconds << " " << t.fraction;
   }
 }
 
@@ -208,17 +189,30 @@ TEST(NsTime, RoundTripIsExactForEveryTimeButTheOneThatWrapsToZero) {
   }
 }
 
-TEST(NsTime, SvTimeComesBackWithinHalfANanosecond) {
-  std::mt19937_64 random(2082);
-  // From 1970 up to where the count of nanoseconds still fits.
-  std::uniform_int_distribution<int64_t> seconds(2082844800, 18000000000);
-  for (int i = 0; i < kSamples; ++i) {
-    const SvTime t{random(), seconds(random)};
-    uint64_t ns = 0;
-    SvTimeToNsTime(&ns, &t);
-    SvTime back;
-    NsTimeToSvTime(&back, &ns);
-    ASSERT_LE(Distance(t, back), kNsHalf + 1) << t.seconds << " " << t.fraction;
+TEST(TimeForms, SvTimeComesBackWithinHalfAStep) {
+  const struct {
+    const char *step;
+    tFromSv from;
+    tToSv to;
+    int64_t lowSeconds, highSeconds;
+    uint64_t half;
+  } forms[] = {
+      {"100 ns", &SvTimeToRawTime, &RawHelperToSv, 0, 1000000000000, kRawHalf},
+      // From 1970 up to where the count of nanoseconds still fits.
+      {"1 ns", &SvTimeToNsTime, &NsHelperToSv, 2082844800, 18000000000, kNsHalf},
+  };
+  std::mt19937_64 random(1904);
+  for (const auto &f : forms) {
+    SCOPED_TRACE(f.step);
+    std::uniform_int_distribution<int64_t> seconds(f.lowSeconds, f.highSeconds);
+    for (int i = 0; i < kSamples; ++i) {
+      const SvTime t{random(), seconds(random)};
+      uint64_t value = 0;
+      f.from(&value, &t);
+      SvTime back;
+      f.to(&back, value);
+      ASSERT_LE(Distance(t, back), f.half + 1) << t.seconds << " " << t.fraction;
+    }
   }
 }
 
