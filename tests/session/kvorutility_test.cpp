@@ -1,11 +1,13 @@
 // Handle classes, host references and the close dispatch, against the host and driver stand-ins.
+#include "session/kvorutility.h"
+
 #include <gtest/gtest.h>
 
 #include <string>
+#include <vector>
 
 #include "kvsim.h"
 #include "kvsvapi.h"
-#include "session/kvorutility.h"
 #include "support/fake_error_log.h"
 #include "support/slot_fixture.h"
 #include "svsim.h"
@@ -19,14 +21,14 @@ TEST(ClassFromHandle, EveryKindOfHandle) {
     uint32_t handle;
     uint32_t expected;
   } cases[] = {
-      {0x00000000u, kClassNone},      {0x01000000u, kClassSystem},
-      {0x01000010u, kClassDevice},    {0x01000001u, kClassInterface},
-      {0x01AB1200u, kClassDevice},    {0x01AB120Fu, kClassInterface},
-      {0x0F000000u, kClassNone},      {0x0F123456u, kClassNone},
-      {0x02000000u, kClassSession},   {0x20010001u, kClassSession},
-      {0x00000001u, kClassSession},   {0x80000000u, kClassDatabase},
-      {0x83000000u, kClassSignal},    {0x8F000000u, kClassBareDatabase},
-      {0xF8123456u, kClassPdu},       {0x81FFFFFFu, kClassCluster},
+      {0x00000000u, kClassNone},    {0x01000000u, kClassSystem},
+      {0x01000010u, kClassDevice},  {0x01000001u, kClassInterface},
+      {0x01AB1200u, kClassDevice},  {0x01AB120Fu, kClassInterface},
+      {0x0F000000u, kClassNone},    {0x0F123456u, kClassNone},
+      {0x02000000u, kClassSession}, {0x20010001u, kClassSession},
+      {0x00000001u, kClassSession}, {0x80000000u, kClassDatabase},
+      {0x83000000u, kClassSignal},  {0x8F000000u, kClassBareDatabase},
+      {0xF8123456u, kClassPdu},     {0x81FFFFFFu, kClassCluster},
   };
   for (const auto &c : cases)
     EXPECT_EQ(ClassFromHandle(static_cast<int32_t>(c.handle)), c.expected) << std::hex << c.handle;
@@ -41,6 +43,13 @@ class References : public SlotFixture {
   void TearDown() override {
     gReportImplicitClose = 0;
     SlotFixture::TearDown();
+  }
+
+  // The lines of the reports made so far, in their order.
+  std::vector<uint32_t> ReportLines() const {
+    std::vector<uint32_t> lines;
+    for (const auto &record : log_.Records()) lines.push_back(record.value.Line());
+    return lines;
   }
 
   kvsvtest::cFakeErrorLog log_;
@@ -99,12 +108,11 @@ TEST_F(References, FailuresAreReportedWithTheirLineAndLeaveNothingBehind) {
   svsimSetRefStatus(0);
   EXPECT_EQ(svsimRefCount(), 0);
   EXPECT_EQ(svsimLiveHandles(), liveBefore);
+  EXPECT_EQ(ReportLines(), (std::vector<uint32_t>{2451, 2536}));
   const auto records = log_.Records();
   ASSERT_EQ(records.size(), 2u);
   EXPECT_EQ(records[0].value.File(), 16u);
-  EXPECT_EQ(records[0].value.Line(), 2451u);
   EXPECT_EQ(records[0].value.info, 0u);
-  EXPECT_EQ(records[1].value.Line(), 2536u);
   EXPECT_EQ(records[1].value.info, static_cast<uint32_t>(-7));
 }
 
@@ -129,9 +137,7 @@ TEST_F(References, RemovalByCookie) {
   svsimSetRefStatus(0);
   EXPECT_EQ(svsimRefCount(), 0);
   EXPECT_EQ(UnregisterReference(reference), kvErrInternal);  // gone already
-  const auto records = log_.Records();
-  ASSERT_EQ(records.size(), 1u);
-  EXPECT_EQ(records[0].value.Line(), 2596u);
+  EXPECT_EQ(ReportLines(), std::vector<uint32_t>{2596});
 }
 
 TEST_F(References, RemovalByNameFindsTheHostOperation) {
@@ -145,11 +151,7 @@ TEST_F(References, RemovalByNameFindsTheHostOperation) {
   EXPECT_EQ(UnregisterReferenceByName(kClassBareDatabase, &name), kvErrInternal);
   EXPECT_EQ(UnregisterReferenceByName(kClassDevice, &name), 0);
   EXPECT_EQ(svsimRefCount(), 0);
-  const auto records = log_.Records();
-  ASSERT_EQ(records.size(), 3u);
-  EXPECT_EQ(records[0].value.Line(), 2743u);
-  EXPECT_EQ(records[1].value.Line(), 2743u);
-  EXPECT_EQ(records[2].value.Line(), 2719u);
+  EXPECT_EQ(ReportLines(), (std::vector<uint32_t>{2743, 2743, 2719}));
 }
 
 TEST_F(References, CloseDispatchSendsEachClassToItsClose) {
@@ -181,10 +183,8 @@ TEST_F(References, ImplicitClosesOfSystemObjectsAreReportedWhenAsked) {
   gReportImplicitClose = 1;
   CloseDispatch(system, kClassSystem);
   EXPECT_EQ(kvsvGetSystemRefCount(), 0u);
-  const auto records = log_.Records();
-  ASSERT_EQ(records.size(), 1u);
-  EXPECT_EQ(records[0].value.Line(), 2242u);
-  EXPECT_EQ(records[0].value.info, kClassSystem);
+  EXPECT_EQ(ReportLines(), std::vector<uint32_t>{2242});
+  EXPECT_EQ(log_.Records().at(0).value.info, kClassSystem);
 }
 
 }  // namespace

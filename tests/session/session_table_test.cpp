@@ -88,21 +88,4 @@ TEST_F(SessionTable, DestroySlotFreesEverythingItOwns) {
   DestroySlot(nullptr);
 }
 
-TEST_F(SessionTable, ProjectSessionOpenFollowsTheInterfaceRecordsOnly) {
-  ASSERT_EQ(PlaceSlot(0x00000042u), 0);
-  EXPECT_EQ(kvsvGetIsProjectSessionOpen(), 0);  // a manual session makes no record
-  {
-    std::lock_guard<cRecursiveMutex> lock(*gSessionManager.mutex);
-    auto *record = new cSnLifeInterface();
-    record->sessions["Input"] = new cSnLifeSession();
-    gSessionManager.InsertInterface("CAN1", record);
-  }
-  EXPECT_EQ(kvsvGetIsProjectSessionOpen(), 1);
-  {
-    std::lock_guard<cRecursiveMutex> lock(*gSessionManager.mutex);
-    gSessionManager.EraseInterface("CAN1");
-  }
-  EXPECT_EQ(kvsvGetIsProjectSessionOpen(), 0);
-}
-
 }  // namespace

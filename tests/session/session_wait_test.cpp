@@ -91,22 +91,25 @@ TEST_F(SessionWait, ARaisedConditionEndsTheWaitWithItsValue) {
   EXPECT_EQ(record.size1, kParameter);
 }
 
-TEST_F(SessionWait, AWaitThatRunsOutReturnsTheDriversTimeout) {
-  for (double timeLimit : {0.0, 0.05}) {
-    uint32_t value = 0xEEEEEEEE;
-    EXPECT_EQ(kvsvSessionWait(session_, kvsimConditionIntfCommunicating, 0, &value, timeLimit),
-              kvsimErrTimeout)
-        << timeLimit;
-    EXPECT_EQ(value, 0xEEEEEEEEu);
-  }
-}
-
-TEST_F(SessionWait, AnErrorSessionAnswersWithItsFailure) {
+TEST_F(SessionWait, TheDriversFailureComesBackAndLeavesTheValue) {
   uint32_t failed = 0;
   ASSERT_EQ(kvhdnCreateErrorSession(kvsimErrUnknownInterface, &failed), 0);
-  uint32_t value = 0;
-  EXPECT_EQ(kvsvSessionWait(failed, kvsimConditionIntfCommunicating, 0, &value, 1.0),
-            kvsimErrUnknownInterface);
+  const struct {
+    uint32_t session;
+    double timeLimit;
+    int32_t status;
+  } cases[] = {
+      {session_, 0.0, kvsimErrTimeout},
+      {session_, 0.05, kvsimErrTimeout},
+      {failed, 1.0, kvsimErrUnknownInterface},
+  };
+  for (const auto &c : cases) {
+    SCOPED_TRACE(testing::Message() << std::hex << c.session << " " << c.timeLimit);
+    uint32_t value = 0xEEEEEEEE;
+    EXPECT_EQ(kvsvSessionWait(c.session, kvsimConditionIntfCommunicating, 0, &value, c.timeLimit),
+              c.status);
+    EXPECT_EQ(value, 0xEEEEEEEEu);
+  }
 }
 
 TEST_F(SessionWait, TheAbortIsRegisteredBeforeTheDriverIsCalled) {

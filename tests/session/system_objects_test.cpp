@@ -210,52 +210,37 @@ TEST_F(SystemObjects, SecondOpenOfANameRemovesTheFirstHostReference) {
   EXPECT_EQ(kvsimOpenSystemCount(), 0);
 }
 
-TEST_F(SystemObjects, OtherNamesKeepTheirHostReferences) {
-  uint32_t can = 0, lin = 0, device = 0;
-  ASSERT_EQ(OpenInterface("CAN1", &can), 0);
-  ASSERT_EQ(OpenInterface("LIN2", &lin), 0);
-  ASSERT_EQ(OpenDevice(kBusBoxCanLin, &device), 0);
-  const SvRefnum canRef = RegisterHostRef("CAN1", can, "KVOR Interface");
-  const SvRefnum linRef = RegisterHostRef("LIN2", lin, "KVOR Interface");
-  const SvRefnum deviceRef = RegisterHostRef(kBusBoxCanLin, device, "KVOR Device");
+TEST_F(SystemObjects, OpenWhileTheSystemFailsCarriesTheFailureAndTheNextOpenRetries) {
+  using Open = kvsvStatus (*)(SvHandle *, uint32_t *);
+  const struct {
+    const char *what;
+    Open open;
+    SvHandle *name;
+    SvHandle *nextName;
+  } cases[] = {
+      {"system", &kvsvSystemOpen, nullptr, nullptr},
+      {"device", &kvsvDeviceOpen, Name(kBusBoxCanLin), Name(kBusBoxFlexRayEnet)},
+      {"interface", &kvsvInterfaceOpen, Name("CAN1"), Name("CAN4")},
+  };
+  for (const auto &c : cases) {
+    SCOPED_TRACE(c.what);
+    kvsimLogClear();
+    ASSERT_EQ(kvsimFailCall("kvSystemOpen", kDriverFailure, 1), 0);
+    uint32_t failed = 0;
+    EXPECT_EQ(c.open(c.name, &failed), 0);
+    ASSERT_TRUE(IsErrorHandle(failed)) << std::hex << failed;
+    EXPECT_EQ(FirstUse(failed), kDriverFailure);
+    EXPECT_EQ(kvsvGetSystemRefCount(), 0u);
+    EXPECT_EQ(kvsimOpenSystemCount(), 0);
 
-  EXPECT_EQ(kvsvInterfaceClose(lin), 0);
-  EXPECT_TRUE(HostHasRef(canRef));
-  EXPECT_FALSE(HostHasRef(linRef));
-  EXPECT_TRUE(HostHasRef(deviceRef));
-}
-
-TEST_F(SystemObjects, FailedSystemOpenGivesAnErrorHandleAndTheNextOpenRetries) {
-  ASSERT_EQ(kvsimFailCall("kvSystemOpen", kDriverFailure, 1), 0);
-  uint32_t failed = 0;
-  EXPECT_EQ(kvsvSystemOpen(nullptr, &failed), 0);
-  ASSERT_TRUE(IsErrorHandle(failed)) << std::hex << failed;
-  EXPECT_EQ(kvsvGetSystemRefCount(), 0u);
-  EXPECT_EQ(kvsimOpenSystemCount(), 0);
-  uint32_t size = 0;
-  EXPECT_EQ(kvGetPropertySize(failed, kvPropSys_DevRefs, &size), kDriverFailure);
-
-  uint32_t system = 0;
-  EXPECT_EQ(kvsvSystemOpen(nullptr, &system), 0);
-  EXPECT_TRUE(IsSystemObject(system));
-  EXPECT_EQ(kvsvGetSystemRefCount(), 1u);
-  EXPECT_EQ(kvsimCountCalls("kvSystemOpen"), 2);
-  EXPECT_EQ(kvClear(failed), 0);
-}
-
-TEST_F(SystemObjects, ChildOpenedWhileTheSystemFailsCarriesTheDriversFailure) {
-  ASSERT_EQ(kvsimFailCall("kvSystemOpen", kDriverFailure, 1), 0);
-  uint32_t device = 0;
-  EXPECT_EQ(OpenDevice(kBusBoxCanLin, &device), 0);
-  ASSERT_TRUE(IsErrorHandle(device));
-  EXPECT_EQ(FirstUse(device), kDriverFailure);
-  EXPECT_EQ(kvsvGetSystemRefCount(), 0u);
-  EXPECT_EQ(kvsimOpenSystemCount(), 0);
-
-  uint32_t intf = 0;
-  EXPECT_EQ(OpenInterface("CAN4", &intf), 0);
-  EXPECT_EQ(InterfaceName(intf), "CAN4") << "the next open tries the driver again";
-  EXPECT_EQ(kvsvGetSystemRefCount(), 1u);
+    uint32_t next = 0;
+    EXPECT_EQ(c.open(c.nextName, &next), 0);
+    EXPECT_TRUE(IsSystemObject(next)) << std::hex << next;
+    EXPECT_EQ(kvsvGetSystemRefCount(), 1u);
+    EXPECT_EQ(kvsimCountCalls("kvSystemOpen"), 2);
+    kvClear(failed);
+    ASSERT_EQ(kvsvSystemManualClose(nullptr, nullptr), 0);
+  }
 }
 
 TEST_F(SystemObjects, EmptyNamesAndMissingOutputsMakeNothing) {
@@ -286,6 +271,7 @@ TEST_F(SystemObjects, EmptyNamesAndMissingOutputsMakeNothing) {
       {"device, good, no output", &kvsvDeviceOpen, good, false, static_cast<int32_t>(0xBFF63001)},
       {"interface, good, no output", &kvsvInterfaceOpen, good, false,
        static_cast<int32_t>(0xBFF63001)},
+      {"system, no output", &kvsvSystemOpen, nullptr, false, static_cast<int32_t>(0xBFF63001)},
   };
   for (const Case &c : cases) {
     SCOPED_TRACE(c.what);
@@ -300,12 +286,6 @@ TEST_F(SystemObjects, EmptyNamesAndMissingOutputsMakeNothing) {
   static_cast<SvStr *>(**negative)->cnt = -4;
   uint32_t handle = 0;
   EXPECT_EQ(kvsvDeviceOpen(negative, &handle), static_cast<int32_t>(0xBFF630A5));
-  EXPECT_EQ(kvsimLogCount(), 0);
-}
-
-TEST_F(SystemObjects, SystemOpenWithoutOutputTakesNoReference) {
-  EXPECT_EQ(kvsvSystemOpen(nullptr, nullptr), static_cast<int32_t>(0xBFF63001));
-  EXPECT_EQ(kvsvGetSystemRefCount(), 0u);
   EXPECT_EQ(kvsimLogCount(), 0);
 }
 
@@ -350,31 +330,29 @@ TEST_F(SystemObjects, AFailedLastElementOrListIsTheOpensFailure) {
     const char *function;
     uint32_t property;
     bool device;
+    const char *name;
   } cases[] = {
-      {"every interface name", "kvGetPropertySize", kvPropIntf_Name, false},
-      {"every serial number", "kvGetProperty", kvPropDev_SerNum, true},
-      {"the interface list", "kvGetPropertySize", kvPropSys_IntfRefs, false},
-      {"the device list", "kvGetProperty", kvPropSys_DevRefs, true},
+      {"every interface name", "kvGetPropertySize", kvPropIntf_Name, false, "CAN1"},
+      {"every serial number", "kvGetProperty", kvPropDev_SerNum, true, kBusBoxCanLin},
+      {"the interface list", "kvGetPropertySize", kvPropSys_IntfRefs, false, "CAN1"},
+      {"the device list", "kvGetProperty", kvPropSys_DevRefs, true, kBusBoxCanLin},
+      {"every protocol, for a monitor", "kvGetProperty", kvPropIntf_Protocol, false,
+       "ENET1/monitor"},
   };
   for (const Case &c : cases) {
     SCOPED_TRACE(c.what);
     ASSERT_EQ(kvsimFailProperty(c.function, c.property, kDriverFailure, -1), 0);
     uint32_t handle = 0;
-    ASSERT_EQ(c.device ? OpenDevice(kBusBoxCanLin, &handle) : OpenInterface("CAN1", &handle), 0);
+    ASSERT_EQ(c.device ? OpenDevice(c.name, &handle) : OpenInterface(c.name, &handle), 0);
     ASSERT_TRUE(IsErrorHandle(handle));
     kvsimClearFailures();
     EXPECT_EQ(FirstUse(handle), kDriverFailure);
   }
-}
-
-TEST_F(SystemObjects, FailedProtocolReadOfTheLastInterfaceIsTheOpensFailure) {
+  // A direct match of a name needs no protocol.
   ASSERT_EQ(kvsimFailProperty("kvGetProperty", kvPropIntf_Protocol, kDriverFailure, -1), 0);
   uint32_t handle = 0;
   ASSERT_EQ(OpenInterface("CAN3", &handle), 0);
-  EXPECT_EQ(InterfaceName(handle), "CAN3") << "a direct match needs no protocol";
-  ASSERT_EQ(OpenInterface("ENET1/monitor", &handle), 0);
-  ASSERT_TRUE(IsErrorHandle(handle));
-  EXPECT_EQ(FirstUse(handle), kDriverFailure);
+  EXPECT_EQ(InterfaceName(handle), "CAN3");
 }
 
 TEST_F(SystemObjects, AWarningOfTheNameReadComesBackWithTheHandle) {

@@ -21,50 +21,41 @@ class TeardownBlocked : public SlotFixture {
   // A read of `handle` parked inside the driver, holding the slot's guard.
   std::thread BlockedRead(uint32_t handle, kvsvStatus &status, SvHandle &values) {
     EXPECT_EQ(kvsimHold("kvReadSignalSinglePoint"), 0);
-    std::thread reader([handle, &status, &values] {
-      status = kvsvReadSignalSinglePoint(handle, &values);
-    });
+    std::thread reader(
+        [handle, &status, &values] { status = kvsvReadSignalSinglePoint(handle, &values); });
     EXPECT_EQ(kvsimWaitParked("kvReadSignalSinglePoint", 1), 1);
     EXPECT_EQ(Slot(handle)->guard.load(), 1u);
     return reader;
   }
 };
 
-TEST_F(TeardownBlocked, CloseClearsTheDriverSessionSoThatTheBlockedReadReturns) {
-  const auto made = kvsvtest::CreateManual("A,B", kvMode_SignalInSinglePoint, "CAN1");
-  ASSERT_EQ(made.status, 0);
-  kvsvStatus status = 0;
-  SvHandle values = nullptr;
-  std::thread reader = BlockedRead(made.handle, status, values);
-
-  EXPECT_EQ(kvsvSessionClose(made.handle), 0);
-  reader.join();
-  EXPECT_EQ(status, kvsimErrSessionCleared);
-  EXPECT_EQ(Slot(made.handle), nullptr);
-  EXPECT_EQ(kvsvReadSignalSinglePoint(made.handle, &values), kvErrInvalidSession);
-  kvsimRelease("kvReadSignalSinglePoint");
-  Keep(values);
-  svsimEndProgram(nullptr);
-}
-
-TEST_F(TeardownBlocked, AbortFromTheCleanupThreadEndsTheBlockedCall) {
-  const auto made = kvsvtest::CreateManual("A", kvMode_SignalInSinglePoint, "CAN2");
-  ASSERT_EQ(made.status, 0);
-  kvsvStatus status = 0;
-  SvHandle values = nullptr;
-  std::thread reader = BlockedRead(made.handle, status, values);
-  // What a blocking call registers before it enters the driver.
-  ASSERT_EQ(svSetCleanupProc(kvsvSessionAbort, made.handle, 6), 0);
-
-  SvsimEndReport report{};
-  ASSERT_EQ(svsimEndProgram(&report), 0);
-  EXPECT_EQ(report.cleanupsRun, 1);
-  reader.join();
-  EXPECT_EQ(status, kvsimErrSessionCleared);
-  EXPECT_EQ(Slot(made.handle), nullptr);
-  EXPECT_EQ(kvsimOpenSessionCount(), 0);
-  kvsimRelease("kvReadSignalSinglePoint");
-  Keep(values);
+TEST_F(TeardownBlocked, TheBlockedReadReturnsBeforeTheSlotIsFreed) {
+  // The program closes the session, or the host's clean-up thread aborts it as the program stops.
+  for (const bool byAbort : {false, true}) {
+    SCOPED_TRACE(byAbort ? "abort" : "close");
+    const auto made = kvsvtest::CreateManual("A,B", kvMode_SignalInSinglePoint, "CAN1");
+    ASSERT_EQ(made.status, 0);
+    kvsvStatus status = 0;
+    SvHandle values = nullptr;
+    std::thread reader = BlockedRead(made.handle, status, values);
+    if (byAbort) {
+      // What a blocking call registers before it enters the driver.
+      ASSERT_EQ(svSetCleanupProc(kvsvSessionAbort, made.handle, 6), 0);
+      SvsimEndReport report{};
+      ASSERT_EQ(svsimEndProgram(&report), 0);
+      EXPECT_EQ(report.cleanupsRun, 1);
+    } else {
+      EXPECT_EQ(kvsvSessionClose(made.handle), 0);
+    }
+    reader.join();
+    EXPECT_EQ(status, kvsimErrSessionCleared);
+    EXPECT_EQ(Slot(made.handle), nullptr);
+    EXPECT_EQ(kvsimOpenSessionCount(), 0);
+    EXPECT_EQ(kvsvReadSignalSinglePoint(made.handle, &values), kvErrInvalidSession);
+    kvsimRelease("kvReadSignalSinglePoint");
+    Keep(values);
+    svsimEndProgram(nullptr);
+  }
 }
 
 TEST_F(TeardownBlocked, AbortOfAnErrorHandleOnlyFreesTheGuard) {

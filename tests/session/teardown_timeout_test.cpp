@@ -47,52 +47,43 @@ class TeardownTimeout : public SlotFixture {
   }
 };
 
-TEST_F(TeardownTimeout, GuardNeverFreedEndsInAReportAndTheSlotIsFreedAnyway) {
-  kvsvtest::cFakeErrorLog log;
-  const uint32_t session = MakeSession("A", kvMode_SignalInSinglePoint);
-  Slot(session)->guard = 1;
-  EXPECT_EQ(Teardown(session), kvErrInternal);
-  EXPECT_EQ(gSleeps.load(), 1000);
-  EXPECT_EQ(gLastRequestNs.load(), 100000000L);
-  EXPECT_EQ(Slot(session), nullptr);
-  const auto records = log.Records();
-  ASSERT_EQ(records.size(), 1u);
-  EXPECT_EQ(records[0].value.File(), 11u);
-  EXPECT_EQ(records[0].value.Line(), 1485u);
-  EXPECT_EQ(records[0].value.info, 0u);
-}
-
-TEST_F(TeardownTimeout, ListGuardIsAwaitedToo) {
-  kvsvtest::cFakeErrorLog log;
-  const uint32_t session = MakeSession("A", kvMode_SignalInSinglePoint);
-  Slot(session)->listGuard = 1;
-  EXPECT_EQ(Teardown(session), kvErrInternal);
-  EXPECT_EQ(gSleeps.load(), 1000);
-}
-
-TEST_F(TeardownTimeout, GuardFreedDuringTheWaitLetsTheTeardownFinish) {
-  kvsvtest::cFakeErrorLog log;
-  const uint32_t session = MakeSession("A", kvMode_SignalInSinglePoint);
-  tSessionSlot *slot = Slot(session);
-  slot->guard = 1;
-  gOnSleep = [slot](int n) {
-    if (n == 3) slot->guard = 0;
+TEST_F(TeardownTimeout, GuardsAreAwaitedUpToTheLastPoll) {
+  const struct {
+    const char *what;
+    std::atomic<uint32_t> tSessionSlot::*held;
+    int freedAt;  // the poll after which the guard is let go; 0: never
+    Status status;
+    int polls;
+  } cases[] = {
+      {"guard never freed", &tSessionSlot::guard, 0, kvErrInternal, 1000},
+      {"list guard never freed", &tSessionSlot::listGuard, 0, kvErrInternal, 1000},
+      {"guard freed during the wait", &tSessionSlot::guard, 3, 0, 3},
+      // Let go during the last sleep: too late, for no look follows it.
+      {"guard freed at the last poll", &tSessionSlot::guard, 1000, kvErrInternal, 1000},
   };
-  EXPECT_EQ(Teardown(session), 0);
-  EXPECT_EQ(gSleeps.load(), 3);
-  EXPECT_TRUE(log.Records().empty());
-}
-
-TEST_F(TeardownTimeout, GuardFreedOnlyAtTheLastLookStillCountsAsTooLate) {
-  kvsvtest::cFakeErrorLog log;
-  const uint32_t session = MakeSession("A", kvMode_SignalInSinglePoint);
-  tSessionSlot *slot = Slot(session);
-  slot->guard = 1;
-  gOnSleep = [slot](int n) {
-    if (n == 1000) slot->guard = 0;
-  };
-  EXPECT_EQ(Teardown(session), kvErrInternal);
-  EXPECT_EQ(log.Records().size(), 1u);
+  for (const auto &c : cases) {
+    SCOPED_TRACE(c.what);
+    kvsvtest::cFakeErrorLog log;
+    const uint32_t session = MakeSession("A", kvMode_SignalInSinglePoint);
+    tSessionSlot *slot = Slot(session);
+    (slot->*c.held) = 1;
+    gSleeps = 0;
+    gLastRequestNs = 0;
+    gOnSleep = [slot, &c](int n) {
+      if (n == c.freedAt) (slot->*c.held) = 0;
+    };
+    EXPECT_EQ(Teardown(session), c.status);
+    EXPECT_EQ(gSleeps.load(), c.polls);
+    EXPECT_EQ(gLastRequestNs.load(), 100000000L);
+    // The slot goes whether or not its guards were let go.
+    EXPECT_EQ(Slot(session), nullptr);
+    const auto records = log.Records();
+    ASSERT_EQ(records.size(), c.status != 0 ? 1u : 0u);
+    if (c.status == 0) continue;
+    EXPECT_EQ(records[0].value.File(), 11u);
+    EXPECT_EQ(records[0].value.Line(), 1485u);
+    EXPECT_EQ(records[0].value.info, 0u);
+  }
 }
 
 }  // namespace
