@@ -24,14 +24,6 @@ void Set(tInternalStatus &status, eSetter setter, uint32_t component, uint32_t f
   }
 }
 
-TEST(InternalStatus, StartsEmpty) {
-  tInternalStatus status;
-  EXPECT_EQ(status.info, 0u);
-  EXPECT_EQ(status.location, 0u);
-  EXPECT_FALSE(status.Failed());
-  EXPECT_EQ(status.Kind(), uint32_t{tInternalStatus::kEmpty});
-}
-
 struct tSetterCase {
   eSetter setter;
   uint32_t component, file, line, number;
@@ -51,6 +43,9 @@ TEST(InternalStatus, SettersPackTheLocationWord) {
   };
   for (const tSetterCase &c : cases) {
     tInternalStatus status;
+    ASSERT_FALSE(status.Failed());
+    ASSERT_EQ(status.Kind(), uint32_t{tInternalStatus::kEmpty});
+    ASSERT_EQ(status.info, 0u);
     Set(status, c.setter, c.component, c.file, c.line, c.number);
     EXPECT_EQ(status.location, c.location) << std::hex << c.location;
     EXPECT_EQ(status.info, c.info) << std::hex << c.location;
