@@ -19,47 +19,40 @@ class ReadFlexRay : public FrameReadTest {
   }
 };
 
-TEST_F(ReadFlexRay, FramesUpToTheLimitCrossTheBus) {
-  kvsimSetClock(kGoldenRawTime);
-  const uint32_t lengths[] = {0, 32, 254};
-  tBytes records;
-  for (uint32_t i = 0; i < 3; ++i)
-    AppendRecord(records, 0x7F + i, 0x05, 0x33, 0x9C, static_cast<uint8_t>(lengths[i]),
-                 Pattern(lengths[i], static_cast<uint8_t>(i)),
-                 lengths[i] == 0 ? 24 : 16 + ((lengths[i] + 7) & ~7u));
-  Write(records);
+TEST_F(ReadFlexRay, RecordsUpToTheLimitWithEveryIdentifierAndFlagBit) {
+  const struct {
+    uint32_t recordId;
+    uint8_t flags;
+    uint32_t length;
+    uint16_t id;
+    tBytes shown;  // Flag0, 1, 2, 4, 5 and Echo
+  } frames[] = {{0x7F, 0x33, 0, 0x7F, {1, 1, 0, 1, 1, 0}},
+                {0x80, 0x33, 32, 0x80, {1, 1, 0, 1, 1, 0}},
+                {0x0001007F, 0x33, 254, 0x007F, {1, 1, 0, 1, 1, 0}},
+                {0xFFFF0002, 0x84, 0, 0x0002, {0, 0, 1, 0, 0, 1}},
+                {0x0000FFFF, 0x48, 0, 0xFFFF, {0, 0, 0, 0, 0, 0}}};
+  tBytes stream;
+  for (uint8_t i = 0; i < 5; ++i) {
+    const uint32_t length = frames[i].length;
+    AppendRecord(stream, frames[i].recordId, 0x05, frames[i].flags, 0x9C,
+                 static_cast<uint8_t>(length), Pattern(length, i),
+                 length == 0 ? 24 : 16 + ((length + 7) & ~7u), kGoldenRawTime);
+  }
+  Serve(stream);
   ASSERT_EQ(Read(10), 0);
-  ASSERT_EQ(Count(frames_), 3);
-  for (int32_t i = 0; i < 3; ++i) {
+  ASSERT_EQ(Count(frames_), 5);
+  for (uint8_t i = 0; i < 5; ++i) {
     SCOPED_TRACE(i);
     ExpectTime(i, 0);
-    EXPECT_EQ(At<uint16_t>(i, kId), 0x7F + i);
-    EXPECT_EQ(Bytes(i, kType, 8), (tBytes{0x05, 0x9C, 1, 1, 0, 1, 1, 0}));
-    EXPECT_EQ(PayloadOf(i), Pattern(lengths[i], static_cast<uint8_t>(i)));
+    EXPECT_EQ(At<uint16_t>(i, kId), frames[i].id);
+    EXPECT_EQ(Bytes(i, kType, 2), (tBytes{0x05, 0x9C}));
+    EXPECT_EQ(Bytes(i, kFlag0, 6), frames[i].shown);
+    EXPECT_EQ(PayloadOf(i), Pattern(frames[i].length, i));
     EXPECT_GE(svGetHandleSize(Payload(i)), 261u);
   }
   const kvsimCallRecord call = LastCallOf("kvhdnReadFrame");
   EXPECT_EQ(call.size1, 2720u);  // ten records of 272 bytes
   EXPECT_EQ(call.size2, 10u);
-}
-
-TEST_F(ReadFlexRay, FlagBitsAndIdentifierOfARecord) {
-  const struct {
-    uint32_t recordId;
-    uint8_t flags;
-    uint16_t id;
-    tBytes shown;
-  } cases[] = {{0x0001007F, 0x33, 0x007F, {1, 1, 0, 1, 1, 0}},
-               {0xFFFF0002, 0x84, 0x0002, {0, 0, 1, 0, 0, 1}},
-               {0x0000FFFF, 0x48, 0xFFFF, {0, 0, 0, 0, 0, 0}}};
-  tBytes stream;
-  for (const auto &c : cases) AppendRecord(stream, c.recordId, 0, c.flags, 0, 0, {}, 24);
-  Serve(stream);
-  ASSERT_EQ(Read(3), 0);
-  for (int32_t i = 0; i < 3; ++i) {
-    EXPECT_EQ(At<uint16_t>(i, kId), cases[i].id) << i;
-    EXPECT_EQ(Bytes(i, kFlag0, 6), cases[i].shown) << i;
-  }
 }
 
 TEST_F(ReadFlexRay, PayloadOverTheLimitIsClipped) {

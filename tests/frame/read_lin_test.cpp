@@ -19,37 +19,33 @@ class ReadLin : public FrameReadTest {
   }
 };
 
-TEST_F(ReadLin, FramesCrossTheBusWithInfoAndFlag) {
-  kvsimSetClock(kGoldenRawTime);
-  tBytes records;
-  AppendRecord(records, 0x3C, 0x03, 0x01, 0x5A, 8, Pattern(8, 1), 24);
-  AppendRecord(records, 0x21, 0x00, 0x00, 0x00, 2, {0xCA, 0xFE}, 24);
-  Write(records);
-  ASSERT_EQ(Read(2), 0);
-  ASSERT_EQ(Count(frames_), 2);
-  ExpectTime(0, 0);
-  EXPECT_EQ(At<uint32_t>(0, kId), 0x3Cu);
-  EXPECT_EQ(Bytes(0, kType, 4), (tBytes{0x03, 0x5A, 1, 0}));
-  EXPECT_EQ(Bytes(1, kType, 4), (tBytes{0x00, 0x00, 0, 0}));
-  EXPECT_EQ(PayloadOf(0), Pattern(8, 1));
-  EXPECT_EQ(PayloadOf(1), (tBytes{0xCA, 0xFE}));
-  EXPECT_EQ(svGetHandleSize(Payload(1)), 15u);
-}
-
-TEST_F(ReadLin, IdentifierIsTheLowByteAndFlagsGiveTwoBits) {
+TEST_F(ReadLin, RecordsWithInfoAndFlagsTheLowByteOfTheIdentifierAndTwoFlagBits) {
   const struct {
     uint32_t recordId;
-    uint8_t flags;
+    uint8_t type, flags, info;
+    tBytes payload;
     uint32_t id;
     uint8_t flag0, echo;
-  } cases[] = {{0x12345678, 0x81, 0x78, 1, 1}, {0x0140, 0x80, 0x40, 0, 1}, {0xFF, 0x7E, 0xFF, 0, 0}};
+  } frames[] = {{0x3C, 0x03, 0x01, 0x5A, Pattern(8, 1), 0x3C, 1, 0},
+                {0x21, 0x00, 0x00, 0x00, {0xCA, 0xFE}, 0x21, 0, 0},
+                {0x12345678, 0x00, 0x81, 0x00, {}, 0x78, 1, 1},
+                {0x0140, 0x00, 0x80, 0x00, {}, 0x40, 0, 1},
+                {0xFF, 0x00, 0x7E, 0x00, {}, 0xFF, 0, 0}};
   tBytes stream;
-  for (const auto &c : cases) AppendRecord(stream, c.recordId, 0, c.flags, 0, 0, {}, 24);
+  for (const auto &f : frames)
+    AppendRecord(stream, f.recordId, f.type, f.flags, f.info,
+                 static_cast<uint8_t>(f.payload.size()), f.payload, 24, kGoldenRawTime);
   Serve(stream);
-  ASSERT_EQ(Read(3), 0);
-  for (int32_t i = 0; i < 3; ++i) {
-    EXPECT_EQ(At<uint32_t>(i, kId), cases[i].id) << i;
-    EXPECT_EQ(Bytes(i, kType + 2, 2), (tBytes{cases[i].flag0, cases[i].echo})) << i;
+  ASSERT_EQ(Read(5), 0);
+  ASSERT_EQ(Count(frames_), 5);
+  for (int32_t i = 0; i < 5; ++i) {
+    SCOPED_TRACE(i);
+    ExpectTime(i, 0);
+    EXPECT_EQ(At<uint32_t>(i, kId), frames[i].id);
+    EXPECT_EQ(Bytes(i, kType, 4),
+              (tBytes{frames[i].type, frames[i].info, frames[i].flag0, frames[i].echo}));
+    EXPECT_EQ(PayloadOf(i), frames[i].payload);
+    EXPECT_EQ(svGetHandleSize(Payload(i)), 15u);
   }
 }
 

@@ -64,16 +64,13 @@ TEST_F(WriteEthernet, BufferIsReusedForFewerFramesAndReplacedForMore) {
   EXPECT_EQ(kvsimCountPropertyReads(kvPropSession_PayldLenMax), 0);
 }
 
-TEST_F(WriteEthernet, EmptyArrayStillPassesTheGuard) {
+TEST_F(WriteEthernet, AnEmptyArrayStillPassesTheGuardANullOneIsReportedBeforeIt) {
   cClusterArray empty(0, kStride, kPayload);
   EXPECT_EQ(kvsvWriteFrameEthernet(writer_, empty.handle(), 0.0), 0);
   EXPECT_EQ(Slot(writer_)->cachedCount, 0);
   EXPECT_EQ(LastCallOf("kvhdnWriteFrameEthernet").size1, 0u);
   const uint32_t noSlot = DriverSession(kvMode_FrameOutQueued, "ENET1");
   EXPECT_EQ(kvsvWriteFrameEthernet(noSlot, empty.handle(), 0.0), kvErrInvalidSession);
-}
-
-TEST_F(WriteEthernet, NullArrayIsReportedBeforeTheGuard) {
   cFakeErrorLog log;
   Slot(writer_)->guard = 1;
   EXPECT_EQ(kvsvWriteFrameEthernet(writer_, nullptr, 0.0), kvErrInternal);

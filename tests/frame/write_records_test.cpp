@@ -1,5 +1,5 @@
-// CAN, LIN and FlexRay frame writes: the records the driver is handed in each form, frames across
-// the buses, the whole-write refusal, the session's set-up and its failures, the steady loop and
+// CAN, LIN and FlexRay frame writes: the records the driver is handed in each form, the
+// whole-write refusal, the session's set-up and its failures, the steady loop and
 // the empty write's way past the session table.
 #include "frame/frame_write_support.h"
 #include "kvorproperties.h"
@@ -110,24 +110,6 @@ TEST_F(WriteRecords, RecordsAreWhatTheClustersSay) {
     c.build(frames);
     ASSERT_EQ(c.protocol->write(writer_, frames.handle(), 0.0), 0);
     EXPECT_EQ(LastWrite(writer_), c.expected);
-  }
-}
-
-TEST_F(WriteRecords, FramesCrossTheBusToTheReader) {
-  kvsimSetClock(kGoldenRawTime);
-  for (const tProtocol *p : {&kCan, &kLin, &kFlexRay}) {
-    SCOPED_TRACE(p->name);
-    Writer(*p);
-    const uint32_t reader = DriverSession(kvMode_FrameInQueued, p->in);
-    cClusterArray frames(2, p->stride, kPayload);
-    Fill(frames, 2, 5);
-    ASSERT_EQ(p->write(writer_, frames.handle(), 0.0), 0);
-    tBytes got(100);
-    uint32_t bytes = 0;
-    ASSERT_EQ(kvReadFrame(reader, got.data(), 100, 0.0, &bytes), 0);
-    got.resize(bytes);
-    EXPECT_EQ(got, Join({Record(0x100, 0, 0, 0, 5, Pattern(5, 0), 24),
-                         Record(0x101, 0, 0, 0, 5, Pattern(5, 1), 24)}));
   }
 }
 
