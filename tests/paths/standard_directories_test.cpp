@@ -53,13 +53,6 @@ TEST(DirectoryTable, DefaultsWithoutRelocation) {
   EXPECT_EQ(linux.GetInitdDir(), "/etc/init.d");
 }
 
-TEST(SysqWrapper, FixedDirectories) {
-  kvpath::cSysqWrapper sysq;
-  const ovsysq::SysqWrapper &own = sysq;
-  EXPECT_EQ(own.GetRunDir(), "/var/run");
-  EXPECT_EQ(own.GetLocalStateDir(), "/var/local/orvane");
-}
-
 TEST(SysqWrapper, TempDirFromTmpdirAsItStands) {
   kvpath::cSysqWrapper sysq;
   const std::pair<std::optional<std::string>, std::string> cases[] = {
