@@ -59,15 +59,6 @@ TEST_F(ConsoleTrace, DescribesItselfIntoABufferOfAnySize) {
     EXPECT_EQ(end, buffer + std::strlen(c.copied)) << c.size;
     EXPECT_EQ(needed, 20u);
   }
-  EXPECT_TRUE(console.IsReady());
-  EXPECT_STREQ(console.Name(), "ovsdbg_printf");
-}
-
-TEST(ProcessTrace, BuiltAtLoadWithTheConsoleAndLyingIdle) {
-  tTrace &trace = ProcessTrace();
-  EXPECT_EQ(trace.Destination(), &ConsoleTraceDestination());
-  EXPECT_TRUE(trace.Lock().try_lock());
-  trace.Lock().unlock();
 }
 
 }  // namespace
