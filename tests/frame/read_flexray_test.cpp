@@ -1,5 +1,5 @@
-// FlexRay frame reads through the library against the driver stand-in's FlexRay1-FlexRay2 bus
-// and served record streams: variable records up to the session's own payload limit.
+// FlexRay frame reads through the library of record streams served by the driver stand-in to a
+// FlexRay2 session: variable records up to the session's own payload limit.
 #include "frame/frame_read_support.h"
 
 namespace {

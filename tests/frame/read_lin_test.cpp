@@ -1,5 +1,5 @@
-// LIN frame reads through the library against the driver stand-in's LIN1-LIN2 bus and served
-// record streams: always the fixed form, with a limit of 8 bytes.
+// LIN frame reads through the library of record streams served by the driver stand-in to a LIN2
+// session: always the fixed form, with a limit of 8 bytes.
 #include "frame/frame_read_support.h"
 
 namespace {
