@@ -193,6 +193,29 @@ enum kvStateId {
   kvState_LINScheduleChange = 0x130081
 };
 int32_t kvWriteState(uint32_t session, uint32_t stateId, uint32_t size, const void *value);
+/* States that kvReadState gives, each with the one size it takes. The communication words are
+ * packed bit fields whose meaning is the driver's. Times are raw times; the 24-byte time records
+ * (first time, second time, a 32-bit word whose bit 0 is a flag, 4 bytes unused) belong to
+ * Ethernet sessions and hold 1 ns times. */
+enum kvReadStateId {
+  kvState_CANComm = 0x130010,          /* 4 bytes */
+  kvState_FlexRayComm = 0x130020,      /* 4 bytes; bits 24-31 the current cycle */
+  kvState_LINComm = 0x130030,          /* 8 bytes: two words */
+  kvState_J1939Comm = 0x130040,        /* 16 bytes */
+  kvState_FlexRayStats = 0x8130021,    /* 24 bytes */
+  kvState_TimeCurrent = 0x7130001,     /* 8 bytes: the driver's time now */
+  kvState_TimeStart = 0x7130002,       /* 8 bytes: when the bus started; 0 before */
+  kvState_TimeComm = 0x7130003,        /* 8 bytes: the third time the driver keeps */
+  kvState_TimeCurrentLong = 0xC130005, /* 24 bytes each: the same three as time records */
+  kvState_TimeStartLong = 0xC130006,
+  kvState_TimeCommLong = 0xC130007
+};
+/* Reads state `stateId` into `value`; `fault`, where not null, gets the driver's fault word. */
+int32_t kvReadState(uint32_t session, uint32_t stateId, uint32_t size, void *value,
+                    uint32_t *fault);
+/* Blocks until the session's time trigger fires, or `timeout` seconds pass (negative: none), and
+ * gives its 24-byte time record. */
+int32_t kvReadStateTimeTrigger(uint32_t session, uint32_t size, void *value, double timeout);
 
 /* Signals. Buffer sizes are in bytes. */
 int32_t kvReadSignalSinglePoint(uint32_t session, double *values, uint32_t valuesSize,

@@ -54,6 +54,8 @@ constexpr DriverFunction kFunctions[] = {
     {"kvConvertFramesToSignalsSinglePoint", true, false},
     {"kvConvertByteArrayToFramesSinglePoint", true, false},
     {"kvConvertFramesToByteArraySinglePoint", true, false},
+    {"kvReadState", true, false},
+    {"kvReadStateTimeTrigger", true, false},
 };
 
 }  // namespace

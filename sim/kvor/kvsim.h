@@ -228,6 +228,17 @@
  *                     of a session on a LIN interface (else kvsimErrWrongProtocol): the value is
  *                     a 4-byte schedule index (another size: kvsimErrInvalidArgument), kept as it
  *                     is written (kvsimLinSchedule). Any other state is kvsimErrUnknownState.
+ *   kvReadState       Knows the states of enum kvReadStateId (kvsvplatform.h), each with its one
+ *                     size (another: kvsimErrInvalidArgument); the 24-byte time records only on
+ *                     Ethernet sessions (else kvsimErrWrongProtocol); any other identifier is
+ *                     kvsimErrUnknownState. Gives what kvsimSetState set, and its fault word in
+ *                     `fault` where that is not null; a state never set reads as zeros, fault 0.
+ *   kvReadStateTimeTrigger
+ *                     Size 24 only (else kvsimErrInvalidArgument). Waits until the clock reaches
+ *                     the time of the trigger that kvsimSetTimeTrigger set, then gives its record.
+ *                     The time limit is in seconds, negative for none, 0 for no wait; a wait that
+ *                     runs out, or a session with no trigger, gives kvsimErrTimeout, a clear of
+ *                     the session kvsimErrSessionCleared, a NaN limit kvsimErrInvalidArgument.
  */
 #ifndef KVSIM_H
 #define KVSIM_H
@@ -384,6 +395,8 @@ KVSIM_API void kvsimClearFailures(void);
  *   kvBlink                  interface                  0           mode           0
  *   kvdbCloseDatabase        database                   0           closeAll       0
  *   kvWriteState             session                    state       size           0
+ *   kvReadState              session                    state       size           0
+ *   kvReadStateTimeTrigger   session                    0           size           0
  *   kvReadFrame              session                    0           size           0
  *   kvhdnReadFrame           session                    0           size           numFrames
  *   kvWriteFrame             session                    0           size           0
@@ -566,6 +579,20 @@ KVSIM_API int32_t kvsimBlinkMode(const char *interfaceName);
  * selected, 0 if none was since the session was made, -1 for a session that is not open (error
  * sessions included) or a null `index`. */
 KVSIM_API int32_t kvsimLinSchedule(uint32_t session, uint32_t *index);
+
+/* ==== States ================================================================================= */
+
+/* Sets what kvReadState gives for `stateId` on the session: the `size` bytes at `bytes`, and
+ * `fault` as its fault word. Returns 0, or -1 for a session that is not open (error sessions
+ * included), a null `bytes`, or a state and size that kvReadState would refuse on the session. */
+KVSIM_API int32_t kvsimSetState(uint32_t session, uint32_t stateId, uint32_t size,
+                                const void *bytes, uint32_t fault);
+
+/* Arms the session's time trigger: from the moment the clock reaches `firesAt` (raw time),
+ * kvReadStateTimeTrigger gives the 24 bytes at `record`, until the trigger is set again. A reset
+ * or a clear of the session drops it. Returns 0, or -1 for a session that is not open (error
+ * sessions included) or a null `record`. */
+KVSIM_API int32_t kvsimSetTimeTrigger(uint32_t session, uint64_t firesAt, const void *record);
 
 /* ==== Counts ================================================================================= */
 

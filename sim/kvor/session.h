@@ -1,6 +1,6 @@
 // One session of the driver: its definition, the properties set on it, the events its blocked
-// calls wait for, the terminal routes it connected, the point up to which it was flushed, and its
-// frame and signal traffic. An error session has no definition and answers every use with the
+// calls wait for, the terminal routes it connected, the point up to which it was flushed, its
+// frame and signal traffic, and the states that tests set for it. An error session has no definition and answers every use with the
 // status it was made with.
 #ifndef KVOR_SIM_SESSION_H
 #define KVOR_SIM_SESSION_H
@@ -14,12 +14,15 @@
 #include "frame_inbox.h"
 #include "frame_last_writes.h"
 #include "frame_read_stream.h"
+#include "future_trigger.h"
 #include "property_store.h"
 #include "session_definition.h"
 #include "session_events.h"
+#include "session_states.h"
 #include "signal_inputs.h"
 #include "signal_outputs.h"
 #include "terminals.h"
+#include "written_states.h"
 
 namespace nKvorSim {
 
@@ -45,6 +48,7 @@ class Session {
   FrameLastWrites &LastWrites() { return lastWrites_; }
   SignalInputs &SignalsIn() { return signalsIn_; }
   SignalOutputs &SignalsOut() { return signalsOut_; }
+  SessionStates &States() { return states_; }
 
   // Signal values published on the network up to this publication number arrived before the
   // latest flush, and the session no longer holds them.
@@ -59,6 +63,9 @@ class Session {
   }
   void SelectLinSchedule(uint32_t index) { linSchedule_.store(index); }
 
+  WrittenStates &StatesWritten() { return statesWritten_; }
+  FutureTrigger &Trigger() { return trigger_; }
+
  private:
   const SessionDefinition definition_;
   const Status errorStatus_ = 0;
@@ -70,8 +77,11 @@ class Session {
   FrameLastWrites lastWrites_;
   SignalInputs signalsIn_;
   SignalOutputs signalsOut_;
+  SessionStates states_;
   std::atomic<uint64_t> flushedThrough_{0};
   std::atomic<int64_t> linSchedule_{-1};  // -1: no schedule selected
+  WrittenStates statesWritten_;
+  FutureTrigger trigger_;
 };
 
 }  // namespace nKvorSim
