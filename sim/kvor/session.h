@@ -1,7 +1,7 @@
 // One session of the driver: its definition, the properties set on it, the events its blocked
 // calls wait for, the terminal routes it connected, the point up to which it was flushed, its
-// frame and signal traffic, and the states that tests set for it. An error session has no definition and answers every use with the
-// status it was made with.
+// frame and signal traffic, and the states that tests set for it. An error session has no
+// definition and answers every use with the status it was made with.
 #ifndef KVOR_SIM_SESSION_H
 #define KVOR_SIM_SESSION_H
 
@@ -14,7 +14,6 @@
 #include "frame_inbox.h"
 #include "frame_last_writes.h"
 #include "frame_read_stream.h"
-#include "future_trigger.h"
 #include "property_store.h"
 #include "session_definition.h"
 #include "session_events.h"
@@ -22,7 +21,6 @@
 #include "signal_inputs.h"
 #include "signal_outputs.h"
 #include "terminals.h"
-#include "written_states.h"
 
 namespace nKvorSim {
 
@@ -63,9 +61,6 @@ class Session {
   }
   void SelectLinSchedule(uint32_t index) { linSchedule_.store(index); }
 
-  WrittenStates &StatesWritten() { return statesWritten_; }
-  FutureTrigger &Trigger() { return trigger_; }
-
  private:
   const SessionDefinition definition_;
   const Status errorStatus_ = 0;
@@ -80,8 +75,6 @@ class Session {
   SessionStates states_;
   std::atomic<uint64_t> flushedThrough_{0};
   std::atomic<int64_t> linSchedule_{-1};  // -1: no schedule selected
-  WrittenStates statesWritten_;
-  FutureTrigger trigger_;
 };
 
 }  // namespace nKvorSim
