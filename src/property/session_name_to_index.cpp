@@ -3,7 +3,7 @@
 #include <new>
 
 #include "kvorproperties.h"
-#include "property/property_value_io.h"
+#include "property/property_name_list.h"
 #include "session/name_list.h"
 #include "session/slot_guard.h"
 
@@ -13,20 +13,11 @@ namespace {
 
 bool IsDigit(unsigned char c) { return c >= '0' && c <= '9'; }
 
-// The slot's names, read from the driver at the first lookup.
-Status EnsureNameList(uint32_t session, tSessionSlot &slot) {
-  if (slot.sessionNameList != nullptr) return 0;
-  tMallocBlock text;
-  const Status status = ReadTextBlock<tSessionPropertyCalls>(session, kvPropSession_List, text);
-  if (status < 0) return status;
-  slot.sessionNameList = new cNameList(text.get());
-  return 0;
-}
-
 Status LookUpName(uint32_t session, const SvStr &name, int32_t *indexOut) {
   cSlotGuard guard(session, &tSessionSlot::listGuard);
   if (!guard) return guard.status();
-  const Status status = EnsureNameList(session, guard.slot());
+  const Status status =
+      EnsurePropertyNameList(session, kvPropSession_List, guard.slot().sessionNameList);
   if (status < 0) return status;
   const int32_t index =
       guard.slot().sessionNameList->Find(reinterpret_cast<const char *>(name.str), name.cnt);
