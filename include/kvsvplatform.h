@@ -193,6 +193,9 @@ enum kvStateId {
   kvState_LINScheduleChange = 0x130081
 };
 int32_t kvWriteState(uint32_t session, uint32_t stateId, uint32_t size, const void *value);
+/* Arms the session's trigger at `when`, a raw time, or a 1 ns time since 1970 on an Ethernet
+ * session; `option` is passed through. */
+int32_t kvFutureTimeTrigger(uint32_t session, uint64_t when, uint32_t option);
 /* States that kvReadState gives, each with the one size it takes. The communication words are
  * packed bit fields whose meaning is the driver's. Times are raw times; the 24-byte time records
  * (first time, second time, a 32-bit word whose bit 0 is a flag, 4 bytes unused) belong to

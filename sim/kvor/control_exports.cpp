@@ -10,6 +10,7 @@
 #include "driver_functions.h"
 #include "inventory.h"
 #include "kvsim.h"
+#include "kvsvplatform.h"
 #include "session_events.h"
 
 using namespace nKvorSim;
@@ -195,6 +196,32 @@ int32_t kvsimLinSchedule(uint32_t session, uint32_t *index) {
   const std::optional<uint32_t> selected = target->LinSchedule();
   if (!selected) return 0;
   *index = *selected;
+  return 1;
+}
+
+int32_t kvsimAllowStateWrite(uint32_t session, uint32_t stateId) {
+  const std::shared_ptr<Session> target = ControlledSession(session);
+  if (!target || stateId == kvState_LINScheduleChange) return -1;
+  target->StatesWritten().Allow(stateId);
+  return 0;
+}
+
+int32_t kvsimLastState(uint32_t session, uint32_t stateId, uint32_t *value) {
+  const std::shared_ptr<Session> target = ControlledSession(session);
+  if (!target || value == nullptr || !target->StatesWritten().Allows(stateId)) return -1;
+  const std::optional<uint32_t> last = target->StatesWritten().Last(stateId);
+  if (!last) return 0;
+  *value = *last;
+  return 1;
+}
+
+int32_t kvsimFutureTrigger(uint32_t session, uint64_t *when, uint32_t *option) {
+  const std::shared_ptr<Session> target = ControlledSession(session);
+  if (!target || when == nullptr || option == nullptr) return -1;
+  const std::optional<ArmedTrigger> armed = target->Trigger().Armed();
+  if (!armed) return 0;
+  *when = armed->when;
+  *option = armed->option;
   return 1;
 }
 

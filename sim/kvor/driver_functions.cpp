@@ -56,6 +56,7 @@ constexpr DriverFunction kFunctions[] = {
     {"kvConvertFramesToByteArraySinglePoint", true, false},
     {"kvReadState", true, false},
     {"kvReadStateTimeTrigger", true, false},
+    {"kvFutureTimeTrigger", true, false},
 };
 
 }  // namespace

@@ -38,6 +38,7 @@ constexpr StatusText kTexts[] = {
     {kvsimErrTimeout, "The time limit elapsed before the operation completed."},
     {kvsimErrSessionCleared, "The session was cleared while the operation waited."},
     {kvsimErrInvalidCondition, "The wait condition is not valid."},
+    {kvsimErrTimeInPast, "The trigger time has already passed."},
     {kvsimErrInvalidTerminal,
      "A terminal name is not valid, or the route joins a terminal to itself."},
     {kvsimErrNotConnected, "The session has not connected these terminals."},

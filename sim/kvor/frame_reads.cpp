@@ -10,14 +10,11 @@
 #include "inventory.h"
 #include "kvsim.h"
 #include "kvsvplatform.h"
+#include "virtual_clock.h"
 
 namespace nKvorSim {
 
 namespace {
-
-// Ethernet times count 1 ns from 1970; rawTime counts 100 ns from 1601.
-constexpr uint64_t kRawTime1970 = 116444736000000000ull;
-constexpr uint64_t kNsPerRawTick = 100;
 
 Status CheckInput(const Session &session, double timeLimit, bool ethernet) {
   const SessionDefinition &definition = session.Definition();
@@ -59,12 +56,6 @@ uint32_t ReadLatest(const Session &session, RecordForm form, uint8_t *buffer, ui
     offset += bytes;
   }
   return offset;
-}
-
-uint64_t NsTime(uint64_t rawTime) {
-  // A clock set before 1970 runs as a relative time, so that small test times stay small.
-  if (rawTime < kRawTime1970) return rawTime * kNsPerRawTick;
-  return (rawTime - kRawTime1970) * kNsPerRawTick;
 }
 
 void FillDescriptor(const Frame &frame, tEthernetReadDescriptor *descriptor) {

@@ -224,10 +224,12 @@
  *   kvdbCloseDatabase Answers kvsimErrInvalidDatabase for a handle of no loaded database.
  *   Error handles     kvBlink and kvdbCloseDatabase also answer an error session, given in place
  *                     of their object, with its status, as the session calls do.
- *   kvWriteState      Knows one state, kvState_LINScheduleChange, which selects the LIN schedule
- *                     of a session on a LIN interface (else kvsimErrWrongProtocol): the value is
- *                     a 4-byte schedule index (another size: kvsimErrInvalidArgument), kept as it
- *                     is written (kvsimLinSchedule). Any other state is kvsimErrUnknownState.
+ *   kvWriteState      Knows kvState_LINScheduleChange, which selects the LIN schedule of a
+ *                     session on a LIN interface (else kvsimErrWrongProtocol), and the states that
+ *                     a test declared writable on the session (kvsimAllowStateWrite); any other
+ *                     state is kvsimErrUnknownState. The value is 4 bytes (another size:
+ *                     kvsimErrInvalidArgument), kept as it is written (kvsimLinSchedule,
+ *                     kvsimLastState).
  *   kvReadState       Knows the states of enum kvReadStateId (kvsvplatform.h), each with its one
  *                     size (another: kvsimErrInvalidArgument); the 24-byte time records only on
  *                     Ethernet sessions (else kvsimErrWrongProtocol); any other identifier is
@@ -239,6 +241,14 @@
  *                     The time limit is in seconds, negative for none, 0 for no wait; a wait that
  *                     runs out, or a session with no trigger, gives kvsimErrTimeout, a clear of
  *                     the session kvsimErrSessionCleared, a NaN limit kvsimErrInvalidArgument.
+ *   kvFutureTimeTrigger
+ *                     Output sessions only (modes 3, 4, 5, 9, 10, 11; else kvsimErrWrongMode).
+ *                     The time is in the session's units: 1 ns since 1970 on Ethernet, as its
+ *                     frame times (a clock before 1970 counts as its own value times 100), raw
+ *                     time on the other protocols. A time before the clock is
+ *                     kvsimErrTimeInPast; the clock's own time is accepted. The time and the
+ *                     option, which may be any value, are kept as given (kvsimFutureTrigger),
+ *                     the last over an earlier one; nothing fires.
  */
 #ifndef KVSIM_H
 #define KVSIM_H
@@ -289,6 +299,8 @@ enum kvsimStatus {
   kvsimErrTimeout = (int32_t)0xBFF62040,          /* the time limit ran out */
   kvsimErrSessionCleared = (int32_t)0xBFF62041,  /* the session was cleared while the call waited */
   kvsimErrInvalidCondition = (int32_t)0xBFF62042, /* kvWait does not know the condition */
+  kvsimErrTimeInPast = (int32_t)0xBFF62043,       /* kvFutureTimeTrigger: the time is before
+                                                     the clock */
   kvsimErrInvalidTerminal = (int32_t)0xBFF62050,  /* not a terminal name, or a terminal routed to
                                                      itself */
   kvsimErrNotConnected = (int32_t)0xBFF62051,     /* the session has not connected that route */
@@ -397,6 +409,7 @@ KVSIM_API void kvsimClearFailures(void);
  *   kvWriteState             session                    state       size           0
  *   kvReadState              session                    state       size           0
  *   kvReadStateTimeTrigger   session                    0           size           0
+ *   kvFutureTimeTrigger      session                    0           option         0
  *   kvReadFrame              session                    0           size           0
  *   kvhdnReadFrame           session                    0           size           numFrames
  *   kvWriteFrame             session                    0           size           0
@@ -579,6 +592,23 @@ KVSIM_API int32_t kvsimBlinkMode(const char *interfaceName);
  * selected, 0 if none was since the session was made, -1 for a session that is not open (error
  * sessions included) or a null `index`. */
 KVSIM_API int32_t kvsimLinSchedule(uint32_t session, uint32_t *index);
+
+/* ==== State writes and the future time trigger =============================================== */
+
+/* Lets kvWriteState write the 4-byte state `stateId` on the session from now on, until the
+ * session is cleared. Returns 0, or -1 for a session that is not open (error sessions included)
+ * or for kvState_LINScheduleChange, which every LIN session knows. */
+KVSIM_API int32_t kvsimAllowStateWrite(uint32_t session, uint32_t stateId);
+
+/* The value that kvWriteState wrote last to the writable state `stateId` of the session into
+ * *value: 1 if one was written, 0 if none was since it was declared writable, -1 for a session
+ * that is not open, a state not declared writable on it, or a null `value`. */
+KVSIM_API int32_t kvsimLastState(uint32_t session, uint32_t stateId, uint32_t *value);
+
+/* The time and option of the trigger that kvFutureTimeTrigger armed last on the session: 1 if one
+ * was armed, 0 if none was since the session was made, -1 for a session that is not open (error
+ * sessions included) or a null pointer. */
+KVSIM_API int32_t kvsimFutureTrigger(uint32_t session, uint64_t *when, uint32_t *option);
 
 /* ==== States ================================================================================= */
 

@@ -14,6 +14,7 @@
 #include "frame_inbox.h"
 #include "frame_last_writes.h"
 #include "frame_read_stream.h"
+#include "future_trigger.h"
 #include "property_store.h"
 #include "session_definition.h"
 #include "session_events.h"
@@ -21,6 +22,7 @@
 #include "signal_inputs.h"
 #include "signal_outputs.h"
 #include "terminals.h"
+#include "written_states.h"
 
 namespace nKvorSim {
 
@@ -61,6 +63,9 @@ class Session {
   }
   void SelectLinSchedule(uint32_t index) { linSchedule_.store(index); }
 
+  WrittenStates &StatesWritten() { return statesWritten_; }
+  FutureTrigger &Trigger() { return trigger_; }
+
  private:
   const SessionDefinition definition_;
   const Status errorStatus_ = 0;
@@ -75,6 +80,8 @@ class Session {
   SessionStates states_;
   std::atomic<uint64_t> flushedThrough_{0};
   std::atomic<int64_t> linSchedule_{-1};  // -1: no schedule selected
+  WrittenStates statesWritten_;
+  FutureTrigger trigger_;
 };
 
 }  // namespace nKvorSim

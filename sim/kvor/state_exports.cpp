@@ -1,5 +1,5 @@
-// State writes: kvWriteState. The one state known here selects the LIN schedule of a session on
-// a LIN interface.
+// State writes: kvWriteState. The LIN schedule state selects the schedule of a session on a LIN
+// interface; any other state is written only where a test declared it writable.
 #include <cstring>
 #include <memory>
 
@@ -23,13 +23,18 @@ KVOR_DRIVER_API int32_t kvWriteState(uint32_t session, uint32_t stateId, uint32_
     std::shared_ptr<Session> target;
     const Status status = Driver::Instance().UseSession(session, &target);
     if (status != 0) return status;
-    if (stateId != kvState_LINScheduleChange) return kvsimErrUnknownState;
+    const bool linSchedule = stateId == kvState_LINScheduleChange;
+    if (!linSchedule && !target->StatesWritten().Allows(stateId)) return kvsimErrUnknownState;
     if (value == nullptr) return kvsimErrNullPointer;
     if (size != sizeof(uint32_t)) return kvsimErrInvalidArgument;
+    uint32_t written = 0;
+    std::memcpy(&written, value, sizeof written);
+    if (!linSchedule) {
+      target->StatesWritten().Write(stateId, written);
+      return 0;
+    }
     if (target->Definition().protocol != kProtocolLin) return kvsimErrWrongProtocol;
-    uint32_t index = 0;
-    std::memcpy(&index, value, sizeof index);
-    target->SelectLinSchedule(index);
+    target->SelectLinSchedule(written);
     return 0;
   });
 }

@@ -8,6 +8,15 @@
 
 namespace nKvorSim {
 
+// The driver's 1 ns time since 1970 of a raw time, as Ethernet sessions count. A clock set before
+// 1970 runs as a relative time, so that small test times stay small.
+inline uint64_t NsTime(uint64_t rawTime) {
+  constexpr uint64_t kRawTime1970 = 116444736000000000ull;
+  constexpr uint64_t kNsPerRawTick = 100;
+  if (rawTime < kRawTime1970) return rawTime * kNsPerRawTick;
+  return (rawTime - kRawTime1970) * kNsPerRawTick;
+}
+
 class VirtualClock {
  public:
   uint64_t Now() const { return now_.load(); }
