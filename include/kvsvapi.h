@@ -665,6 +665,30 @@ KVSV_EXPORT kvsvStatus kvsvSessionSetPropExString1D(uint32_t session, SvHandle *
 KVSV_EXPORT kvsvStatus kvsvSessionSetPropString1D(uint32_t session, uint32_t id, SvHandle *value,
                                                   SvHandle *info);
 
+/* ---- State writes and triggers ------------------------------------------------------------ */
+
+/* Selects the LIN schedule of `session` by the host string *schedule. A null or empty string is
+ * schedule 0. A text that starts with a digit is the schedule's index in decimal (0xBFF6317D if
+ * it is not a number below 2^31), needing no slot. Any other text is the name of a schedule among
+ * the session's schedule names, read from the driver once per slot and kept; blanks around the
+ * name do not count, and a name may leave out what follows its first '.' (0xBFF6317E for no
+ * match). A name lookup holds the slot's list guard: 0xBFF63020 for no slot, 0xBFF63027 if
+ * another lookup holds it or the session is closing, the driver's status if the names cannot be
+ * read, 0xBFF63010 for no memory. On any of these nothing is written; otherwise the driver's
+ * status of the write. */
+KVSV_EXPORT kvsvStatus kvsvWriteStateLINScheduleChange(uint32_t session, SvHandle *schedule);
+
+/* Writes the 32-bit `value` to the driver's state `stateId` of `session`, with no check. The
+ * driver's status. */
+KVSV_EXPORT kvsvStatus kvsvWriteStateU32(uint32_t session, uint32_t stateId, uint32_t value);
+
+/* Arms the driver's trigger of `session` at *when, passing `option` on. The time goes to the
+ * driver in 1 ns units since 1970 for an Ethernet session, in 100 ns units since 1601 otherwise,
+ * so the session's protocol is read first: its failure is returned and arms nothing. 0xBFF63015
+ * for a null `when`; otherwise the driver's status. */
+KVSV_EXPORT kvsvStatus kvsvFutureTimeTrigger(uint32_t session, const SvTime *when,
+                                             uint32_t option);
+
 #ifdef __cplusplus
 }
 #endif
