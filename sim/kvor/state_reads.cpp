@@ -13,8 +13,8 @@
 
 using namespace nKvorSim;
 
-KVOR_DRIVER_API int32_t kvReadState(uint32_t session, uint32_t stateId, uint32_t size,
-                                    void *value, uint32_t *fault) {
+KVOR_DRIVER_API int32_t kvReadState(uint32_t session, uint32_t stateId, uint32_t size, void *value,
+                                    uint32_t *fault) {
   CallArgs args = SessionCallArgs("kvReadState", session, size);
   args.propertyId = stateId;
   return RunSessionCall(args, session, [&](Driver &, Session &target) -> Status {
