@@ -689,6 +689,65 @@ KVSV_EXPORT kvsvStatus kvsvWriteStateU32(uint32_t session, uint32_t stateId, uin
 KVSV_EXPORT kvsvStatus kvsvFutureTimeTrigger(uint32_t session, const SvTime *when,
                                              uint32_t option);
 
+/* ---- State reads ---------------------------------------------------------------------------
+ * The driver's state of a session. None but kvsvReadStateFlexRayTime uses the session's slot:
+ * they run beside any read or write on the session, and an unknown session is the driver's to
+ * report. */
+
+/* Communication state, unpacked into the host cluster at `cluster`. Every form writes the
+ * driver's fault word at byte 0 (32 bits) and at byte 4 a 1 if it is not 0, else 0, then bit
+ * fields of the driver's packed state (w, x: its 32-bit words; bytes not listed are left alone):
+ *   CAN:     5 w bits 0-3, 6 w bits 8-11, 7 w bits 24-31, 8 w bits 16-23, 9 w bit 4, 10 w bit 5
+ *   LIN:     5 w bits 2-3, 6 w bits 4-7, 7 w bits 8-15, 8 w bits 16-23, 9 w bits 24-29,
+ *            10 w bit 1, 11 w bit 31, 12 x bits 0-7
+ *   FlexRay: 5 w bits 0-3, 6 w bits 4-7, 7 w bits 8-12, 8 w bit 13, 9 w bit 14
+ *   J1939:   8 to 15 the first 8 bytes of the driver's 16-byte record, as they are
+ * The cluster is unpacked whatever the driver's status, which is returned: after a failure it
+ * holds what the driver left, so look at the status first. 0xBFF63015: `cluster` is null. */
+KVSV_EXPORT kvsvStatus kvsvReadStateCANComm(uint32_t session, void *cluster);
+KVSV_EXPORT kvsvStatus kvsvReadStateLINComm(uint32_t session, void *cluster);
+KVSV_EXPORT kvsvStatus kvsvReadStateFlexRayComm(uint32_t session, void *cluster);
+KVSV_EXPORT kvsvStatus kvsvReadStateJ1939Comm(uint32_t session, void *cluster);
+
+/* The driver's 24 bytes of FlexRay statistics, straight into `statistics`. The driver's status. */
+KVSV_EXPORT kvsvStatus kvsvReadStateFlexRayStats(uint32_t session, void *statistics);
+
+/* The 32-bit state `stateId`, straight into *value. The driver's status. */
+KVSV_EXPORT kvsvStatus kvsvReadStateU32(uint32_t session, uint32_t stateId, uint32_t *value);
+
+/* The 8-byte time state `stateId` (raw time) into *time, converted whatever the driver's status,
+ * which is returned. 0xBFF63001: `time` is null, nothing read. */
+KVSV_EXPORT kvsvStatus kvsvReadStateTime(uint32_t session, uint32_t stateId, SvTime *time);
+
+/* Time state `stateId` with its second time and flag. An Ethernet session reads the 24-byte time
+ * record of 1 ns times as asked; any other reads the 8-byte raw time, a record identifier asking
+ * for its 8-byte state, and gives a second time of zero and a flag of 0. 0xBFF63001: a null
+ * pointer, nothing read. A failure of the driver, in reading the session's protocol or the
+ * state, clears the three outputs and is returned; otherwise the driver's status, a warning
+ * included. */
+KVSV_EXPORT kvsvStatus kvsvReadStateTime2(uint32_t session, uint32_t stateId, SvTime *first,
+                                          SvTime *second, uint8_t *flag);
+
+/* Waits in the driver for the session's time trigger, up to `timeout` seconds (negative: no
+ * limit), and gives the two times and the flag of its 24-byte record, 1 ns times for an Ethernet
+ * session and raw times for any other. A timeout other than 0.0 (NaN too) first registers
+ * kvsvSessionAbort as the program's clean-up. 0xBFF63001: a null pointer, nothing read. A failed
+ * protocol read is returned with the outputs as they were; a failure of the wait clears them. */
+KVSV_EXPORT kvsvStatus kvsvReadStateTimeTrigger(uint32_t session, SvTime *first, SvTime *second,
+                                                uint8_t *flag, double timeout);
+
+/* The current FlexRay cycle (0 to 63) into *cycle and the nearest macrotick within it into
+ * *macrotick, worked out from the driver's current time and bus start time. The bus's timing is
+ * read from the driver once per start of the bus and kept in the session's slot; while the start
+ * time stays the same, a call costs two state reads. Both outputs are 0 on any failure:
+ * 0xBFF63015 a null pointer (nothing touched); 0xBFF63020 no such session; 0xBFF63027 the session
+ * is in use by another call or closing; 0xBFF630C1 the bus has not started, or its timing is 0 or
+ * does not give a macrotick of at least one time unit; 0xBFF63080 the driver has no FlexRay
+ * timing for the session; 0xBFF63010 out of memory; otherwise the driver's status, the first
+ * warning of its calls included. */
+KVSV_EXPORT kvsvStatus kvsvReadStateFlexRayTime(uint32_t session, uint8_t *cycle,
+                                                uint16_t *macrotick);
+
 #ifdef __cplusplus
 }
 #endif
