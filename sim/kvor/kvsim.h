@@ -235,9 +235,11 @@
  *                     Ethernet sessions (else kvsimErrWrongProtocol); any other identifier is
  *                     kvsimErrUnknownState. Gives what kvsimSetState set, and its fault word in
  *                     `fault` where that is not null; a state never set reads as zeros, fault 0.
+ *                     A null value is kvsimErrNullPointer, after the checks of state and size.
  *   kvReadStateTimeTrigger
- *                     Size 24 only (else kvsimErrInvalidArgument). Waits until the clock reaches
- *                     the time of the trigger that kvsimSetTimeTrigger set, then gives its record.
+ *                     Size 24 only (else kvsimErrInvalidArgument; a null value is
+ *                     kvsimErrNullPointer). Waits until the clock reaches the time of the
+ *                     trigger that kvsimSetTimeTrigger set, then gives its record.
  *                     The time limit is in seconds, negative for none, 0 for no wait; a wait that
  *                     runs out, or a session with no trigger, gives kvsimErrTimeout, a clear of
  *                     the session kvsimErrSessionCleared, a NaN limit kvsimErrInvalidArgument.
