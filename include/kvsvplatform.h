@@ -154,6 +154,9 @@ int32_t kvdbCreateObject(uint32_t parent, uint32_t objectClass, const char *name
                          uint32_t *object);
 /* Deletes a cluster, frame (with its signals and PDU), signal or ECU. */
 int32_t kvdbDeleteObject(uint32_t object);
+/* Makes a handle that stands for an open that failed with `status`: calls on it give `status`,
+ * and kvdbCloseDatabase ends it. */
+int32_t kvhdndbCreateErrorObject(int32_t status, uint32_t *object);
 /* Properties of database objects; the identifier's class must be the object's. */
 int32_t kvdbGetPropertySize(uint32_t object, uint32_t id, uint32_t *size);
 int32_t kvdbGetProperty(uint32_t object, uint32_t id, uint32_t size, void *value);

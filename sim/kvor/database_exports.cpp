@@ -1,6 +1,7 @@
 // Databases: kvdbOpenDatabase, kvdbCloseDatabase, kvdbFindObject, kvdbCreateObject,
 // kvdbDeleteObject, kvdbGetPropertySize, kvdbGetProperty, kvdbSetProperty, kvdbSaveDatabase,
-// kvdbAddAlias, kvdbAddAlias64, kvdbRemoveAlias, kvdbGetDatabaseListSizes, kvdbGetDatabaseList.
+// kvdbAddAlias, kvdbAddAlias64, kvdbRemoveAlias, kvdbGetDatabaseListSizes, kvdbGetDatabaseList,
+// kvhdndbCreateErrorObject.
 #include <cstdio>
 
 #include "driver.h"
@@ -23,12 +24,13 @@ CallArgs DatabaseCall(const char *function, uint32_t object, uint32_t propertyId
   return args;
 }
 
-// A call on an object: an error session given in its place answers with its failure, as every
-// call on an object does.
+// A call on an object: an error session or error object given in its place answers with its
+// failure, as every call on an object does.
 template <class Body>
 Status OnObject(uint32_t object, Body body) {
   Driver &driver = Driver::Instance();
   if (const Status failure = driver.ErrorSessionStatus(object)) return failure;
+  if (const Status failure = driver.Databases().ErrorObjectStatus(object)) return failure;
   return body(driver.Databases());
 }
 
@@ -46,6 +48,8 @@ KVOR_DRIVER_API int32_t kvdbOpenDatabase(const char *name, uint32_t *database) {
 KVOR_DRIVER_API int32_t kvdbCloseDatabase(uint32_t database, uint32_t closeAll) {
   return RunDriverCall(DatabaseCall("kvdbCloseDatabase", database, 0, closeAll), 0,
                        [&](CallArgs &) -> Status {
+                         // The failure an error object stands for was reported at each use.
+                         if (Driver::Instance().Databases().CloseErrorObject(database)) return 0;
                          return OnObject(database, [&](DatabaseRegistry &databases) {
                            return databases.Close(database, closeAll);
                          });
@@ -156,5 +160,14 @@ KVOR_DRIVER_API int32_t kvdbGetDatabaseList(uint64_t target, uint32_t aliasesSiz
   return RunDriverCall(args, 0, [&](CallArgs &) -> Status {
     return Driver::Instance().Databases().GetList(target, aliasesSize, aliases, pathsSize, paths,
                                                   count);
+  });
+}
+
+KVOR_DRIVER_API int32_t kvhdndbCreateErrorObject(int32_t status, uint32_t *object) {
+  CallArgs args = DatabaseCall("kvhdndbCreateErrorObject", 0, 0, static_cast<uint32_t>(status));
+  return RunDriverCall(args, 0, [&](CallArgs &call) -> Status {
+    const Status made = Driver::Instance().Databases().CreateErrorObject(status, object);
+    if (made == 0) call.object = *object;
+    return made;
   });
 }

@@ -14,6 +14,8 @@ namespace {
 constexpr uint64_t kDefaultBaudRate = 500000;
 constexpr uint32_t kHandleTag = 0x80000000u;
 constexpr uint32_t kNumberMask = 0x00FFFFFFu;
+// Class number F, which no object of a database has.
+constexpr uint32_t kErrorObjectTag = 0x8F000000u;
 
 tObjectRef WithClass(const tObjectRef &from, uint32_t objectClass) {
   tObjectRef ref = from;
@@ -485,6 +487,31 @@ std::string DatabaseRegistry::ErrorText() const {
   return errorText_;
 }
 
+Status DatabaseRegistry::CreateErrorObject(Status status, uint32_t *handle) {
+  if (handle == nullptr) return kvsimErrNullPointer;
+  if (status >= 0) return kvsimErrInvalidArgument;
+  std::lock_guard<std::mutex> lock(mutex_);
+  uint32_t made;
+  do {
+    lastErrorNumber_ = lastErrorNumber_ % kNumberMask + 1;
+    made = kErrorObjectTag | lastErrorNumber_;
+  } while (errorObjects_.count(made) != 0);
+  errorObjects_.emplace(made, status);
+  *handle = made;
+  return 0;
+}
+
+Status DatabaseRegistry::ErrorObjectStatus(uint32_t handle) const {
+  std::lock_guard<std::mutex> lock(mutex_);
+  const auto found = errorObjects_.find(handle);
+  return found == errorObjects_.end() ? 0 : found->second;
+}
+
+bool DatabaseRegistry::CloseErrorObject(uint32_t handle) {
+  std::lock_guard<std::mutex> lock(mutex_);
+  return errorObjects_.erase(handle) != 0;
+}
+
 size_t DatabaseRegistry::LoadedCount() const {
   std::lock_guard<std::mutex> lock(mutex_);
   return loaded_.size();
@@ -494,6 +521,7 @@ void DatabaseRegistry::Reset() {
   std::lock_guard<std::mutex> lock(mutex_);
   handles_.clear();
   byObject_.clear();
+  errorObjects_.clear();
   loaded_.clear();
   aliases_.Clear();
   errorText_.clear();

@@ -64,6 +64,14 @@ class DatabaseRegistry {
   // read from its file if it is not loaded; for sessions, which keep what they were made with.
   Status CopyCluster(const char *database, const char *cluster, tCluster *copy);
 
+  // A handle 0x8FIIIIII that stands for an open that failed with `status` (negative only): every
+  // call on it answers `status`, except its close.
+  Status CreateErrorObject(Status status, uint32_t *handle);
+  // The status that the error object `handle` stands for; 0 if it is not one.
+  Status ErrorObjectStatus(uint32_t handle) const;
+  // Ends the error object `handle`; false if it is not one.
+  bool CloseErrorObject(uint32_t handle);
+
   // What went wrong in the latest open, save or alias that failed on a file.
   std::string ErrorText() const;
   size_t LoadedCount() const;
@@ -101,6 +109,8 @@ class DatabaseRegistry {
   std::unordered_map<uint32_t, tEntry> handles_;
   std::map<std::pair<uint32_t, const void *>, uint32_t> byObject_;  // class and object
   uint32_t lastNumber_ = 0;
+  std::unordered_map<uint32_t, Status> errorObjects_;
+  uint32_t lastErrorNumber_ = 0;
   DatabaseAliases aliases_;
   std::string errorText_;
 };

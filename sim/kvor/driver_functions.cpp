@@ -44,6 +44,7 @@ constexpr DriverFunction kFunctions[] = {
     {"kvdbRemoveAlias", true, false},
     {"kvdbGetDatabaseListSizes", true, false},
     {"kvdbGetDatabaseList", true, false},
+    {"kvhdndbCreateErrorObject", true, false},
     {"kvWriteState", true, false},
     {"kvReadFrame", true, false},
     {"kvhdnReadFrame", true, false},

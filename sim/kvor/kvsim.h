@@ -224,6 +224,10 @@
  *   kvdbCloseDatabase Answers kvsimErrInvalidDatabase for a handle of no loaded database.
  *   Error handles     kvBlink and kvdbCloseDatabase also answer an error session, given in place
  *                     of their object, with its status, as the session calls do.
+ *   kvhdndbCreateErrorObject
+ *                     Takes a negative status only (else kvsimErrInvalidArgument) and makes an
+ *                     error object 0x8FIIIIII. Every kvdb call on it returns that status and
+ *                     touches no output, except kvdbCloseDatabase, which ends it and returns 0.
  *   kvWriteState      Knows kvState_LINScheduleChange, which selects the LIN schedule of a
  *                     session on a LIN interface (else kvsimErrWrongProtocol), and the states that
  *                     a test declared writable on the session (kvsimAllowStateWrite); any other
@@ -408,6 +412,7 @@ KVSIM_API void kvsimClearFailures(void);
  *                            session                    0           0              0
  *   kvBlink                  interface                  0           mode           0
  *   kvdbCloseDatabase        database                   0           closeAll       0
+ *   kvhdndbCreateErrorObject handle made (0 if failed)  0           the status     0
  *   kvWriteState             session                    state       size           0
  *   kvReadState              session                    state       size           0
  *   kvReadStateTimeTrigger   session                    0           size           0
