@@ -19,13 +19,4 @@ bool cDbLifeDatabase::ReleaseOne(uint32_t handle) {
   return holdersRemain;
 }
 
-void cDbLifeDatabase::EraseTextsOf(uint32_t handle) {
-  for (auto it = texts.begin(); it != texts.end();) {
-    if (it->second->object.object == handle)
-      it = texts.erase(it);
-    else
-      ++it;
-  }
-}
-
 }  // namespace nKVSVAPI100

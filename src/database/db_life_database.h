@@ -23,8 +23,6 @@ class cDbLifeDatabase : boost::noncopyable {
   // Takes one holder from the first text of `handle` that still has one. True if any text of
   // `handle` keeps a holder afterwards.
   bool ReleaseOne(uint32_t handle);
-  // Ends every text of `handle`.
-  void EraseTextsOf(uint32_t handle);
 
   tTexts texts;
   uint32_t openKind = kDbOpenUndecided;

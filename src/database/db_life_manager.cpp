@@ -72,7 +72,26 @@ Status cDbLifeManager::LockKnown(uint32_t handle, uint32_t line) {
   return kvErrDbObjectNotFound;
 }
 
+cDbLifeDatabase::tTexts::iterator cDbLifeManager::EraseText(
+    cDbLifeDatabase::tTexts &texts, cDbLifeDatabase::tTexts::iterator text) {
+  const bool underCursor = walkOpen_ && currentDatabase_ != databases_.end() &&
+                           &currentDatabase_->second->texts == &texts && currentObject_ == text;
+  const auto next = texts.erase(text);
+  if (underCursor) currentObject_ = next;
+  return next;
+}
+
+void cDbLifeManager::EraseTextsOf(cDbLifeDatabase::tTexts &texts, uint32_t handle) {
+  for (auto it = texts.begin(); it != texts.end();) {
+    if (it->second->object.object == handle)
+      it = EraseText(texts, it);
+    else
+      ++it;
+  }
+}
+
 void cDbLifeManager::EraseDatabase(tDatabases::iterator database) {
+  if (database == currentDatabase_) currentDatabase_ = databases_.end();
   databases_.erase(database);
   numDatabases_.store(static_cast<uint32_t>(databases_.size()));
 }
@@ -176,7 +195,9 @@ Status cDbLifeManager::NextInWalk(tDbObject *objectOut, std::string *nameOut) {
   if (nameOut != nullptr) nameOut->clear();
   if (!walkOpen_)
     return ReportInternalError(kComponentKvsvapi, nFile::kDatabaseLife, kLineNextOutsideWalk, 0);
-  if (currentObject_ == currentDatabase_->second->texts.end()) return 0;
+  if (currentDatabase_ == databases_.end() ||
+      currentObject_ == currentDatabase_->second->texts.end())
+    return 0;
   try {
     if (nameOut != nullptr) *nameOut = currentObject_->first;
   } catch (const std::bad_alloc &) {
@@ -206,7 +227,7 @@ Status cDbLifeManager::ReleaseByHandle(uint32_t handle, uint32_t *lastOut) {
     return 0;
   }
   if (database->second->ReleaseOne(handle)) return 0;
-  database->second->EraseTextsOf(handle);
+  EraseTextsOf(database->second->texts, handle);
   if (database->second->texts.empty()) EraseDatabase(database);
   objects_.erase(handle);
   Store(lastOut, 1);
@@ -229,7 +250,7 @@ Status cDbLifeManager::ReleaseByName(SvHandle name, uint32_t handle, uint32_t *l
   if (text == texts.end() || text->second->refCount == 0) return ReleaseByHandle(handle, lastOut);
   if (--text->second->refCount != 0) return 0;
   Store(lastOut, 1);
-  texts.erase(text);
+  EraseText(texts, text);
   if (texts.empty()) EraseDatabase(database);
   objects_.erase(handle);
   return 0;
@@ -248,7 +269,7 @@ Status cDbLifeManager::RemoveChildren(uint32_t handle) {
       continue;
     }
     objects_.erase(it->second->object.object);
-    it = texts.erase(it);
+    it = EraseText(texts, it);
   }
   return 0;
 }

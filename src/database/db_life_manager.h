@@ -72,6 +72,11 @@ class cDbLifeManager : boost::noncopyable {
   Status LockKnown(uint32_t handle, uint32_t line);
   // AddObject's registration of an object that FindByName left it, under the lock.
   Status Register(SvHandle name, tDbObject &object, Status status, uint32_t kind);
+  // Erasing keeps an open walk's cursor valid: a close that unregistering runs on the walking
+  // thread may release texts, or the whole database, under it.
+  cDbLifeDatabase::tTexts::iterator EraseText(cDbLifeDatabase::tTexts &texts,
+                                              cDbLifeDatabase::tTexts::iterator text);
+  void EraseTextsOf(cDbLifeDatabase::tTexts &texts, uint32_t handle);
   void EraseDatabase(tDatabases::iterator database);
   void ClearCursor();
 
