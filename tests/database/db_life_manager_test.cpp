@@ -59,6 +59,10 @@ class DbLife : public testing::Test {
     EXPECT_EQ(m_.EndWalk(), 0);
     return seen;
   }
+  // The manager outlives each test: texts of their own keep tests apart.
+  std::string T(const char *text) const {
+    return std::string(text) + "@" + std::to_string(db_);
+  }
   static int Calls(const char *function) { return kvsimCountCalls(function); }
 
   cDbLifeManager &m_ = GetDbLifeManager();
@@ -67,38 +71,38 @@ class DbLife : public testing::Test {
 };
 
 TEST_F(DbLife, SameTextOpenedTwiceHasOneHolder) {
-  ASSERT_EQ(Open("F1\ndb", {db_ + 1, db_, kFrame, 0}), 0);
+  ASSERT_EQ(Open(T("F1\ndb"), {db_ + 1, db_, kFrame, 0}), 0);
   EXPECT_EQ(m_.GetNumDatabases(), databasesBefore_ + 1);
-  EXPECT_EQ(Lookup("F1\ndb"), db_ + 1) << "the second open finds the first's object";
+  EXPECT_EQ(Lookup(T("F1\ndb")), db_ + 1) << "the second open finds the first's object";
   uint32_t last = 9;
-  EXPECT_EQ(ReleaseName("F1\ndb", db_ + 1, last), 0);
+  EXPECT_EQ(ReleaseName(T("F1\ndb"), db_ + 1, last), 0);
   EXPECT_EQ(last, 1u) << "the second open added no holder";
-  EXPECT_EQ(Lookup("F1\ndb"), 0u);
+  EXPECT_EQ(Lookup(T("F1\ndb")), 0u);
   EXPECT_EQ(m_.GetNumDatabases(), databasesBefore_) << "the database went with its last text";
 }
 
 TEST_F(DbLife, CreateUnderAKnownTextAddsAHolder) {
-  ASSERT_EQ(Open("F1", {db_ + 1, db_, kFrame, 0}), 0);
-  ASSERT_EQ(Open("F1", {db_ + 1, db_, kFrame, 0}, 0, kDbOpenUndecided), 0);
+  ASSERT_EQ(Open(T("F1"), {db_ + 1, db_, kFrame, 0}), 0);
+  ASSERT_EQ(Open(T("F1"), {db_ + 1, db_, kFrame, 0}, 0, kDbOpenUndecided), 0);
   uint32_t last = 9;
-  EXPECT_EQ(ReleaseName("F1", db_ + 1, last), 0);
+  EXPECT_EQ(ReleaseName(T("F1"), db_ + 1, last), 0);
   EXPECT_EQ(last, 0u);
-  EXPECT_EQ(ReleaseName("F1", db_ + 1, last), 0);
+  EXPECT_EQ(ReleaseName(T("F1"), db_ + 1, last), 0);
   EXPECT_EQ(last, 1u);
 }
 
 TEST_F(DbLife, ReleaseByHandleEndsWhenNoTextOfTheHandleHasHolders) {
-  ASSERT_EQ(Open("F1", {db_ + 1, db_, kFrame, 0}), 0);
-  ASSERT_EQ(Open("F1 again", {db_ + 1, db_, kFrame, 0}), 0);
-  ASSERT_EQ(Open("F2", {db_ + 2, db_, kFrame, 0}), 0);
+  ASSERT_EQ(Open(T("F1"), {db_ + 1, db_, kFrame, 0}), 0);
+  ASSERT_EQ(Open(T("F1 again"), {db_ + 1, db_, kFrame, 0}), 0);
+  ASSERT_EQ(Open(T("F2"), {db_ + 2, db_, kFrame, 0}), 0);
   uint32_t last = 9;
   EXPECT_EQ(ReleaseHandle(db_ + 1, last), 0);
   EXPECT_EQ(last, 0u);
   EXPECT_EQ(ReleaseHandle(db_ + 1, last), 0);
   EXPECT_EQ(last, 1u);
-  EXPECT_EQ(Lookup("F1"), 0u);
-  EXPECT_EQ(Lookup("F1 again"), 0u);
-  EXPECT_EQ(Lookup("F2"), db_ + 2) << "other handles keep their texts";
+  EXPECT_EQ(Lookup(T("F1")), 0u);
+  EXPECT_EQ(Lookup(T("F1 again")), 0u);
+  EXPECT_EQ(Lookup(T("F2")), db_ + 2) << "other handles keep their texts";
   EXPECT_EQ(m_.GetNumDatabases(), databasesBefore_ + 1);
 }
 
@@ -108,7 +112,7 @@ TEST_F(DbLife, UnknownHandles) {
   EXPECT_EQ(ReleaseHandle(unknown, last), kvErrDbObjectNotFound);
   EXPECT_EQ(last, 1u) << "an unknown handle counts as the last: the caller closes it";
   last = 9;
-  EXPECT_EQ(ReleaseName("F1", unknown, last), kvErrDbObjectNotFound);
+  EXPECT_EQ(ReleaseName(T("F1"), unknown, last), kvErrDbObjectNotFound);
   EXPECT_EQ(last, 0u);
   uint32_t count = 9;
   EXPECT_EQ(m_.BeginWalk(unknown, &count), kvErrDbObjectNotFound);
@@ -118,18 +122,18 @@ TEST_F(DbLife, UnknownHandles) {
 }
 
 TEST_F(DbLife, ChildOfARemovedDatabaseIsKnownWithoutDatabase) {
-  ASSERT_EQ(Open("db", {db_, db_, 0, 0}), 0);
-  ASSERT_EQ(Open("F1", {db_ + 1, db_, kFrame, 0}), 0);
+  ASSERT_EQ(Open(T("db"), {db_, db_, 0, 0}), 0);
+  ASSERT_EQ(Open(T("F1"), {db_ + 1, db_, kFrame, 0}), 0);
   ASSERT_EQ(m_.RemoveDatabase(db_), 0);
   EXPECT_EQ(m_.GetNumDatabases(), databasesBefore_);
-  EXPECT_EQ(Lookup("F1"), 0u);
+  EXPECT_EQ(Lookup(T("F1")), 0u);
   Status begun = 1;
   EXPECT_TRUE(Walk(db_ + 1, &begun).empty());
   EXPECT_EQ(begun, 0);
   uint32_t last = 9;
   EXPECT_EQ(ReleaseHandle(db_ + 1, last), 0);
   EXPECT_EQ(last, 1u);
-  EXPECT_EQ(ReleaseName("db", db_, last), 0) << "the database's own entry stayed as well";
+  EXPECT_EQ(ReleaseName(T("db"), db_, last), 0) << "the database's own entry stayed as well";
   EXPECT_EQ(last, 1u);
 }
 
@@ -149,10 +153,10 @@ TEST_F(DbLife, OpenKindsOfADatabaseMustAgree) {
   for (const Case &c : cases) {
     const uint32_t db = FreshDatabase();
     SCOPED_TRACE(testing::Message() << c.first << c.second << c.third);
-    ASSERT_EQ(Open("A", {db + 1, db, kFrame, 0}, 0, c.first), 0);
-    ASSERT_EQ(Open("B", {db + 2, db, kFrame, 0}, 0, c.second), 0);
-    EXPECT_EQ(Open("C", {db + 3, db, kFrame, 0}, 0, c.third), c.expected);
-    EXPECT_EQ(Lookup("C"), c.expected == 0 ? db + 3 : 0u);
+    ASSERT_EQ(Open(T("A"), {db + 1, db, kFrame, 0}, 0, c.first), 0);
+    ASSERT_EQ(Open(T("B"), {db + 2, db, kFrame, 0}, 0, c.second), 0);
+    EXPECT_EQ(Open(T("C"), {db + 3, db, kFrame, 0}, 0, c.third), c.expected);
+    EXPECT_EQ(Lookup(T("C")), c.expected == 0 ? db + 3 : 0u);
     uint32_t last = 9;
     EXPECT_EQ(ReleaseHandle(db + 3, last), c.expected == 0 ? 0 : kvErrDbObjectNotFound);
     ASSERT_EQ(m_.RemoveDatabase(db + 1), 0);
@@ -161,10 +165,10 @@ TEST_F(DbLife, OpenKindsOfADatabaseMustAgree) {
 }
 
 TEST_F(DbLife, RefusedKindClosesTheErrorObjectMadeForIt) {
-  ASSERT_EQ(Open("A", {db_ + 1, db_, kFrame, 0}, 0, kDbOpenManual), 0);
+  ASSERT_EQ(Open(T("A"), {db_ + 1, db_, kFrame, 0}, 0, kDbOpenManual), 0);
   kvsimLogClear();
   tDbObject failed{0, db_, kFrame, 0};
-  cHostText name("B");
+  cHostText name(T("B"));
   m_.FindByName(name.Handle(), nullptr);
   EXPECT_EQ(m_.AddObject(name.Handle(), failed, kvsimErrObjectNotFound, kDbOpenAutomatic),
             kvErrDatabaseModeConflict);
@@ -176,13 +180,13 @@ TEST_F(DbLife, RefusedKindClosesTheErrorObjectMadeForIt) {
   EXPECT_STREQ(closed.function, "kvdbCloseDatabase");
   EXPECT_EQ(closed.object, made.object);
   EXPECT_EQ(closed.size1, 1u);
-  EXPECT_EQ(Lookup("B"), 0u);
+  EXPECT_EQ(Lookup(T("B")), 0u);
 }
 
 TEST_F(DbLife, FailedOpenIsRegisteredAsAnErrorObject) {
   kvsimLogClear();
   tDbObject failed{0, db_, kSignal, 1};
-  cHostText name("S1");
+  cHostText name(T("S1"));
   m_.FindByName(name.Handle(), nullptr);
   ASSERT_EQ(m_.AddObject(name.Handle(), failed, kvsimErrObjectNotFound, kDbOpenAutomatic), 0);
   ASSERT_NE(failed.object, 0u);
@@ -196,10 +200,10 @@ TEST_F(DbLife, FailedOpenIsRegisteredAsAnErrorObject) {
   EXPECT_EQ(kvdbGetPropertySize(failed.object, 0x03000001u, &size), kvsimErrObjectNotFound)
       << "the failure surfaces at the first use";
   const std::map<std::string, tDbObject> seen = Walk(failed.object);
-  ASSERT_EQ(seen.count("S1"), 1u);
-  EXPECT_EQ(seen.at("S1").isErrorObject, 1u);
+  ASSERT_EQ(seen.count(T("S1")), 1u);
+  EXPECT_EQ(seen.at(T("S1")).isErrorObject, 1u);
 
-  EXPECT_EQ(Lookup("S1"), failed.object);
+  EXPECT_EQ(Lookup(T("S1")), failed.object);
   uint32_t last = 9;
   kvsimLogClear();
   EXPECT_EQ(ReleaseHandle(failed.object, last), 0);
@@ -217,8 +221,8 @@ TEST_F(DbLife, FailedOpenIsRegisteredAsAnErrorObject) {
 TEST_F(DbLife, ErrorObjectTheDriverRefusesIsTheStatus) {
   ASSERT_EQ(kvsimFailCall("kvhdndbCreateErrorObject", kvsimErrInvalidArgument, 1), 0);
   tDbObject failed{0, db_, kFrame, 0};
-  EXPECT_EQ(Open("F1", failed, kvsimErrObjectNotFound), kvsimErrInvalidArgument);
-  EXPECT_EQ(Lookup("F1"), 0u);
+  EXPECT_EQ(Open(T("F1"), failed, kvsimErrObjectNotFound), kvsimErrInvalidArgument);
+  EXPECT_EQ(Lookup(T("F1")), 0u);
   EXPECT_EQ(m_.GetNumDatabases(), databasesBefore_);
 }
 
@@ -235,7 +239,7 @@ TEST_F(DbLife, NothingToRegister) {
     EXPECT_EQ(m_.AddObject(c.name, object, 0, kDbOpenManual), 0);
     EXPECT_EQ(object.isErrorObject, 0u);
   }
-  cHostText known("F1");
+  cHostText known(T("F1"));
   m_.FindByName(known.Handle(), nullptr);
   tDbObject reopened{db_ + 1, 0, kFrame, 0};
   EXPECT_EQ(m_.AddObject(known.Handle(), reopened, 0, kDbOpenManual), 0);
@@ -246,37 +250,37 @@ TEST_F(DbLife, NothingToRegister) {
 }
 
 TEST_F(DbLife, ReleaseByNameEndsTheHandleWhateverItsOtherTexts) {
-  ASSERT_EQ(Open("F1", {db_ + 1, db_, kFrame, 0}), 0);
-  ASSERT_EQ(Open("F1 alias", {db_ + 1, db_, kFrame, 0}), 0);
+  ASSERT_EQ(Open(T("F1"), {db_ + 1, db_, kFrame, 0}), 0);
+  ASSERT_EQ(Open(T("F1 alias"), {db_ + 1, db_, kFrame, 0}), 0);
   uint32_t last = 9;
-  EXPECT_EQ(ReleaseName("F1", db_ + 1, last), 0);
+  EXPECT_EQ(ReleaseName(T("F1"), db_ + 1, last), 0);
   EXPECT_EQ(last, 1u);
-  EXPECT_EQ(Lookup("F1 alias"), db_ + 1) << "the other text keeps its holder";
+  EXPECT_EQ(Lookup(T("F1 alias")), db_ + 1) << "the other text keeps its holder";
   EXPECT_EQ(ReleaseHandle(db_ + 1, last), kvErrDbObjectNotFound) << "but the handle is gone";
-  EXPECT_EQ(ReleaseName("F1 alias", db_ + 1, last), kvErrDbObjectNotFound);
+  EXPECT_EQ(ReleaseName(T("F1 alias"), db_ + 1, last), kvErrDbObjectNotFound);
 }
 
 TEST_F(DbLife, ReleaseByNameOfAnUnknownTextReleasesByHandle) {
-  ASSERT_EQ(Open("F1", {db_ + 1, db_, kFrame, 0}), 0);
+  ASSERT_EQ(Open(T("F1"), {db_ + 1, db_, kFrame, 0}), 0);
   uint32_t last = 9;
-  EXPECT_EQ(ReleaseName("never opened", db_ + 1, last), 0);
+  EXPECT_EQ(ReleaseName(T("never opened"), db_ + 1, last), 0);
   EXPECT_EQ(last, 1u);
-  EXPECT_EQ(Lookup("F1"), 0u);
+  EXPECT_EQ(Lookup(T("F1")), 0u);
 }
 
 TEST_F(DbLife, RemoveChildrenKeepsTheDatabasesOwnText) {
-  ASSERT_EQ(Open("db", {db_, db_, 0, 0}), 0);
-  ASSERT_EQ(Open("F1", {db_ + 1, db_, kFrame, 0}), 0);
+  ASSERT_EQ(Open(T("db"), {db_, db_, 0, 0}), 0);
+  ASSERT_EQ(Open(T("F1"), {db_ + 1, db_, kFrame, 0}), 0);
   tDbObject failed{0, db_, kSignal, 0};
-  ASSERT_EQ(Open("S1", failed, kvsimErrObjectNotFound), 0);
-  const uint32_t errorObject = Lookup("S1");
+  ASSERT_EQ(Open(T("S1"), failed, kvsimErrObjectNotFound), 0);
+  const uint32_t errorObject = Lookup(T("S1"));
   ASSERT_NE(errorObject, 0u);
   kvsimLogClear();
   ASSERT_EQ(m_.RemoveChildren(db_), 0);
   EXPECT_EQ(kvsimCountCalls("kvdbCloseDatabase"), 1) << "the error object, and only it";
   const std::map<std::string, tDbObject> seen = Walk(db_);
   ASSERT_EQ(seen.size(), 1u);
-  EXPECT_EQ(seen.begin()->first, "db");
+  EXPECT_EQ(seen.begin()->first, T("db"));
   uint32_t last = 9;
   EXPECT_EQ(ReleaseHandle(db_ + 1, last), kvErrDbObjectNotFound);
   EXPECT_EQ(ReleaseHandle(errorObject, last), kvErrDbObjectNotFound);
@@ -286,9 +290,9 @@ TEST_F(DbLife, RemoveChildrenKeepsTheDatabasesOwnText) {
 
 TEST_F(DbLife, WalkListsEveryTextWithItsObject) {
   const std::map<std::string, tDbObject> opened = {
-      {"db", {db_, db_, 0, 0}},
-      {"F1\ndb", {db_ + 1, db_, kFrame, 0}},
-      {"S1\ndb", {db_ + 2, db_, kSignal, 0}},
+      {T("db"), {db_, db_, 0, 0}},
+      {T("F1\ndb"), {db_ + 1, db_, kFrame, 0}},
+      {T("S1\ndb"), {db_ + 2, db_, kSignal, 0}},
   };
   for (const auto &entry : opened) ASSERT_EQ(Open(entry.first, entry.second), 0);
   const std::map<std::string, tDbObject> seen = Walk(db_ + 2);
@@ -303,6 +307,36 @@ TEST_F(DbLife, WalkListsEveryTextWithItsObject) {
   }
 }
 
+TEST_F(DbLife, WalkSurvivesReleasesOnItsOwnThread) {
+  // Unregistering the host's references during a walk runs their closes on the walking thread:
+  // here the first entry's close takes every other text, the one under the cursor among them,
+  // and then the last text with the database.
+  const std::map<std::string, uint32_t> opened = {
+      {T("db"), db_}, {T("F1"), db_ + 1}, {T("F2"), db_ + 2}, {T("S1"), db_ + 3}};
+  for (const auto &entry : opened) ASSERT_EQ(Open(entry.first, {entry.second, db_, kFrame, 0}), 0);
+  uint32_t count = 0;
+  ASSERT_EQ(m_.BeginWalk(db_, &count), 0);
+  ASSERT_EQ(count, 4u);
+  tDbObject first;
+  std::string firstName;
+  ASSERT_EQ(m_.NextInWalk(&first, &firstName), 0);
+  uint32_t last = 9;
+  for (const auto &entry : opened) {
+    if (entry.first == firstName) continue;
+    EXPECT_EQ(ReleaseName(entry.first, entry.second, last), 0);
+    EXPECT_EQ(last, 1u);
+  }
+  tDbObject next{1, 1, 1, 1};
+  EXPECT_EQ(m_.NextInWalk(&next, nullptr), 0);
+  EXPECT_EQ(next.object, 0u) << "nothing is left after the cursor";
+  EXPECT_EQ(ReleaseHandle(first.object, last), 0);
+  EXPECT_EQ(last, 1u);
+  EXPECT_EQ(m_.NextInWalk(&next, nullptr), 0) << "the walked database is gone";
+  EXPECT_EQ(next.object, 0u);
+  EXPECT_EQ(m_.EndWalk(), 0);
+  EXPECT_EQ(m_.GetNumDatabases(), databasesBefore_);
+}
+
 TEST_F(DbLife, MisuseIsReportedAsInternal) {
   kvsvtest::cFakeErrorLog log;
   tDbObject object{1, 1, 1, 1};
@@ -310,8 +344,8 @@ TEST_F(DbLife, MisuseIsReportedAsInternal) {
   EXPECT_EQ(m_.NextInWalk(&object, &name), kvErrInternal);
   EXPECT_EQ(object.object, 0u);
 
-  ASSERT_EQ(Open("F1", {db_ + 1, db_, kFrame, 0}), 0);
-  cHostText text("F1");
+  ASSERT_EQ(Open(T("F1"), {db_ + 1, db_, kFrame, 0}), 0);
+  cHostText text(T("F1"));
   m_.FindByName(text.Handle(), nullptr);
   tDbObject noObject{0, db_, kFrame, 0};
   EXPECT_EQ(m_.AddObject(text.Handle(), noObject, kvsimErrObjectNotFound, 0), kvErrInternal);
