@@ -2,31 +2,13 @@
 // the failure with its own line and locks nothing, and an unknown handle is still answered as one.
 // This program refuses priority inheritance to every mutex made before its tests start, which is
 // when the manager is built.
-#include <dlfcn.h>
 #include <gtest/gtest.h>
-#include <pthread.h>
-
-#include <atomic>
-#include <cerrno>
 
 #include "database/db_life_manager.h"
 #include "database/db_life_test_support.h"
 #include "kvsim.h"
 #include "support/fake_error_log.h"
-
-namespace {
-
-std::atomic<bool> gRefuseMutexes{true};
-
-}  // namespace
-
-extern "C" int pthread_mutexattr_setprotocol(pthread_mutexattr_t *attributes, int protocol) {
-  if (gRefuseMutexes.load()) return EINVAL;
-  using tSetProtocol = int (*)(pthread_mutexattr_t *, int);
-  static const auto real =
-      reinterpret_cast<tSetProtocol>(dlsym(RTLD_NEXT, "pthread_mutexattr_setprotocol"));
-  return real(attributes, protocol);
-}
+#include "support/refused_mutexes.h"
 
 namespace {
 
@@ -34,7 +16,7 @@ using namespace nKVSVAPI100;
 using kvsvtest::cHostText;
 
 TEST(DbLifeFailedMutex, EachLockingOperationReportsItsLine) {
-  gRefuseMutexes = false;
+  kvsvtest::gRefuseMutexes = false;
   kvsimReset();
   cDbLifeManager &m = GetDbLifeManager();
   ASSERT_EQ(m.status.code, kMutexInitFailed);

@@ -1,12 +1,8 @@
 // A process in which the managers' mutexes could not be made: every export that needs one reports
 // the failure and returns, touching nothing. This program refuses priority inheritance to every
 // mutex made before its tests start, which is when the managers are built.
-#include <dlfcn.h>
 #include <gtest/gtest.h>
-#include <pthread.h>
 
-#include <atomic>
-#include <cerrno>
 #include <string>
 
 #include "kvsim.h"
@@ -15,21 +11,8 @@
 #include "session/session_manager.h"
 #include "session/system_manager.h"
 #include "support/fake_error_log.h"
+#include "support/refused_mutexes.h"
 #include "svsim.h"
-
-namespace {
-
-std::atomic<bool> gRefuseMutexes{true};
-
-}  // namespace
-
-extern "C" int pthread_mutexattr_setprotocol(pthread_mutexattr_t *attributes, int protocol) {
-  if (gRefuseMutexes.load()) return EINVAL;
-  using tSetProtocol = int (*)(pthread_mutexattr_t *, int);
-  static const auto real =
-      reinterpret_cast<tSetProtocol>(dlsym(RTLD_NEXT, "pthread_mutexattr_setprotocol"));
-  return real(attributes, protocol);
-}
 
 namespace {
 
@@ -40,7 +23,7 @@ constexpr uint32_t kMutexFailed = static_cast<uint32_t>(-52003);
 class FailedManagers : public testing::Test {
  protected:
   void SetUp() override {
-    gRefuseMutexes = false;
+    kvsvtest::gRefuseMutexes = false;
     kvsimReset();
     svsimReset();
   }
