@@ -35,7 +35,7 @@ struct tRelocatedRoot {
     setenv("KVSV_TEST_RELOCATION_ROOT", dir.Path().c_str(), 1);
   }
   std::string LogFile() const {
-    return dir.Path() + "/var/lib/kvor/log/kvorErr_diagnostics_error_log_reporter_test.log";
+    return dir.Path() + "/var/lib/kvor/log/kvorErr_diagnostics_concurrency_tests.log";
   }
   kvsvtest::cTempDir dir;
 } gRoot;

@@ -18,7 +18,7 @@ using namespace nKVSVAPI100;
 using kvsvtest::ReadFile;
 using kvsvtest::WriteAt;
 
-constexpr char kProgram[] = "diagnostics_error_log_test";
+constexpr char kProgram[] = "diagnostics_tests";
 constexpr size_t kLine = 128;
 constexpr size_t kFirstRow = 7 * kLine;
 const std::vector<std::string> kVersion{"KVOR driver 24.5.0f49"};

@@ -5,6 +5,7 @@
 
 #include <stdlib.h>
 
+#include <optional>
 #include <string>
 
 #include "paths/paths_test_support.h"
@@ -13,15 +14,23 @@ namespace kvsvtest {
 
 class cRelocationRoot {
  public:
-  // `failingKey`, if given, is a key for which the relocation call fails.
+  // `failingKey`, if given, is a key for which the relocation call fails. The test files of one
+  // program share the root that the first of them made.
   explicit cRelocationRoot(const char *failingKey = nullptr) {
-    setenv("KVSV_TEST_RELOCATION_ROOT", root_.Path().c_str(), 1);
+    if (const char *made = getenv("KVSV_TEST_RELOCATION_ROOT")) {
+      path_ = made;
+    } else {
+      root_.emplace();
+      path_ = root_->Path();
+      setenv("KVSV_TEST_RELOCATION_ROOT", path_.c_str(), 1);
+    }
     if (failingKey != nullptr) setenv("KVSV_TEST_RELOCATION_FAIL", failingKey, 1);
   }
-  const std::string &Path() const { return root_.Path(); }
+  const std::string &Path() const { return path_; }
 
  private:
-  cTempDir root_;
+  std::optional<cTempDir> root_;
+  std::string path_;
 };
 
 }  // namespace kvsvtest

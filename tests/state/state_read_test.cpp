@@ -202,7 +202,7 @@ TEST_F(StateRead, Time2ReadsTheFormOfTheSessionsProtocolAndClearsOnFailure) {
   EXPECT_EQ(kvsvReadStateTime2(can, kvState_TimeStart, nullptr, &time, &flag), kvErrInternal);
   EXPECT_EQ(kvsvReadStateTime2(can, kvState_TimeStart, &time, nullptr, &flag), kvErrInternal);
   EXPECT_EQ(kvsvReadStateTime2(can, kvState_TimeStart, &time, &time, nullptr), kvErrInternal);
-  EXPECT_EQ(kvsimLogCount(), 0);
+  EXPECT_EQ(kvsimCountCalls("kvReadState"), 0);
 }
 
 TEST_F(StateRead, TimeTriggerBlocksUntilTheClockReachesTheTrigger) {

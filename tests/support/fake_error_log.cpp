@@ -15,22 +15,6 @@ namespace {
 
 std::atomic<cFakeErrorLog *> gInstalled{nullptr};
 
-// Between and after fakes the real log takes the reports; in a test program it lives in a
-// directory of the program's own, removed at exit, never in the system's error-log directory.
-struct tRealLogDirectory {
-  tRealLogDirectory() {
-    std::string pattern = (std::filesystem::temp_directory_path() / "kvsvlog.XXXXXX").string();
-    if (mkdtemp(pattern.data()) != nullptr) path = pattern;
-    // Without a directory of its own the log is pointed at one that does not exist: rows drop.
-    nKVSVAPI100::SetErrorLogDirectoryForTests(path.empty() ? "/nonexistent/kvsv-test-log" : path);
-  }
-  ~tRealLogDirectory() {
-    std::error_code ignored;
-    if (!path.empty()) std::filesystem::remove_all(path, ignored);
-  }
-  std::string path;
-} gRealLogDirectory;
-
 }  // namespace
 
 cFakeErrorLog::cFakeErrorLog() {
