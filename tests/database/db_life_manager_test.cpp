@@ -4,364 +4,211 @@
 
 #include <gtest/gtest.h>
 
+#include <array>
 #include <map>
+#include <memory>
 #include <string>
 #include <tuple>
+#include <utility>
+#include <vector>
 
-#include "database/db_life_test_support.h"
 #include "kvsim.h"
-#include "kvsvplatform.h"
 #include "support/fake_error_log.h"
+#include "svsim.h"
 
 namespace {
 
 using namespace nKVSVAPI100;
-using kvsvtest::cHostText;
-using kvsvtest::FreshDatabase;
-using kvsvtest::Lookup;
-using kvsvtest::Open;
+using tRelease = std::pair<Status, uint32_t>;                  // status, last flag
+using tSeen = std::map<std::string, std::array<uint32_t, 4>>;  // text: its tDbObject
 
 constexpr uint32_t kFrame = 0x20000;
-constexpr uint32_t kSignal = 0x30000;
+const tRelease kHeld{0, 0}, kLast{0, 1}, kUnknown{kvErrDbObjectNotFound, 1};
+uint32_t gNextDatabase = 0x80000100u;  // in the driver's form, with room below for objects
+
+// A string handle of the host's, disposed of at the end of its scope.
+std::unique_ptr<void *, int32_t (*)(SvHandle)> HostText(const std::string &text) {
+  return {svsimMakeString(text.c_str()), &svDisposeHandle};
+}
+
+// The driver's calls since the log was cleared.
+using tCall = std::tuple<std::string, uint32_t, int32_t>;  // function, object, status or closeAll
+std::vector<tCall> DriverCalls() {
+  std::vector<tCall> calls;
+  kvsimCallRecord r{};
+  for (int32_t i = 0; kvsimLogEntry(i, &r) == 1; ++i)
+    calls.emplace_back(r.function, r.object, r.size1);
+  return calls;
+}
+// The error object `o` made for kvsimErrObjectNotFound, then closed.
+std::vector<tCall> MadeAndClosed(uint32_t o) {
+  return {{"kvhdndbCreateErrorObject", o, kvsimErrObjectNotFound}, {"kvdbCloseDatabase", o, 1}};
+}
 
 class DbLife : public testing::Test {
  protected:
-  void SetUp() override {
-    kvsimReset();
-    db_ = FreshDatabase();
-    databasesBefore_ = m_.GetNumDatabases();
+  void SetUp() override { kvsimReset(); }
+  std::string T(const std::string &text) const { return text + "@" + std::to_string(db_); }
+  tDbObject Frame(uint32_t offset) const { return {db_ + offset, db_, kFrame, 0}; }
+  // An open as the host makes it: the lookup, whose find goes to `found_`, then the add of what
+  // the driver gave, which leaves the registered object in `made_`.
+  Status Open(const std::string &text, tDbObject object, Status status = 0, uint32_t kind = 0) {
+    const auto name = HostText(T(text));
+    m_.FindByName(name.get(), &found_);
+    made_ = object;
+    return m_.AddObject(name.get(), made_, status, kind);
   }
-  void TearDown() override { kvsimReset(); }
-
-  Status ReleaseHandle(uint32_t handle, uint32_t &last) { return m_.ReleaseByHandle(handle, &last); }
-  Status ReleaseName(const std::string &text, uint32_t handle, uint32_t &last) {
-    cHostText name(text);
-    return m_.ReleaseByName(name.Handle(), handle, &last);
+  // Database 0: an open of a text that the manager knew. What the lookup found.
+  uint32_t Lookup(const char *text) { return Open(text, tDbObject()) == 0 ? found_ : ~0u; }
+  tRelease Release(uint32_t handle, const char *text = nullptr) {
+    uint32_t last = 9;
+    const Status status = text == nullptr
+                              ? m_.ReleaseByHandle(handle, &last)
+                              : m_.ReleaseByName(HostText(T(text)).get(), handle, &last);
+    return {status, last};
   }
   // The texts of the database of `handle` with their objects, as a closing walk sees them.
-  std::map<std::string, tDbObject> Walk(uint32_t handle, Status *begun = nullptr) {
-    std::map<std::string, tDbObject> seen;
+  tSeen Walk(uint32_t handle) {
+    tSeen seen;
     uint32_t count = 99;
-    const Status status = m_.BeginWalk(handle, &count);
-    if (begun != nullptr) *begun = status;
-    if (status != 0 || count == 0) return seen;
-    for (uint32_t i = 0; i < count; ++i) {
-      tDbObject object;
-      std::string name;
-      EXPECT_EQ(m_.NextInWalk(&object, &name), 0);
-      seen[name] = object;
+    EXPECT_EQ(m_.BeginWalk(handle, &count), 0);
+    if (count == 0) return seen;  // a walk over no database has ended already
+    tDbObject o;
+    std::string name;
+    for (uint32_t i = 0; i <= count; ++i) {  // and one past the last: object 0, no text
+      EXPECT_EQ(m_.NextInWalk(&o, &name), 0);
+      if (i < count) seen[name] = {o.object, o.database, o.objectClass, o.isErrorObject};
     }
-    tDbObject end{1, 1, 1, 1};
-    std::string endName = "x";
-    EXPECT_EQ(m_.NextInWalk(&end, &endName), 0);
-    EXPECT_EQ(end.object, 0u) << "a walk ends on object 0";
-    EXPECT_EQ(endName, "");
+    EXPECT_EQ(o.object + name.size(), 0u) << "the end";
     EXPECT_EQ(m_.EndWalk(), 0);
     return seen;
   }
-  // The manager outlives each test: texts of their own keep tests apart.
-  std::string T(const char *text) const {
-    return std::string(text) + "@" + std::to_string(db_);
-  }
-  static int Calls(const char *function) { return kvsimCountCalls(function); }
 
   cDbLifeManager &m_ = GetDbLifeManager();
-  uint32_t db_ = 0;
-  uint32_t databasesBefore_ = 0;
+  // The manager outlives each test: handles and texts of its own keep them apart.
+  uint32_t db_ = gNextDatabase += 0x100u, before_ = m_.GetNumDatabases(), found_ = 0;
+  tDbObject made_;
 };
 
-TEST_F(DbLife, SameTextOpenedTwiceHasOneHolder) {
-  ASSERT_EQ(Open(T("F1\ndb"), {db_ + 1, db_, kFrame, 0}), 0);
-  EXPECT_EQ(m_.GetNumDatabases(), databasesBefore_ + 1);
-  EXPECT_EQ(Lookup(T("F1\ndb")), db_ + 1) << "the second open finds the first's object";
-  uint32_t last = 9;
-  EXPECT_EQ(ReleaseName(T("F1\ndb"), db_ + 1, last), 0);
-  EXPECT_EQ(last, 1u) << "the second open added no holder";
-  EXPECT_EQ(Lookup(T("F1\ndb")), 0u);
-  EXPECT_EQ(m_.GetNumDatabases(), databasesBefore_) << "the database went with its last text";
+TEST_F(DbLife, HoldersOfTextsAndHandles) {
+  ASSERT_EQ(Open("F1", Frame(1)), 0);
+  EXPECT_EQ(m_.GetNumDatabases(), before_ + 1);
+  EXPECT_EQ(Lookup("F1"), db_ + 1) << "an open that finds the text adds no holder";
+  ASSERT_EQ(Open("F1", Frame(1), 0, kDbOpenUndecided), 0) << "a create under it adds one";
+  EXPECT_EQ(Release(db_ + 1, "F1"), kHeld);
+  EXPECT_EQ(Release(db_ + 1, "F1"), kLast);
+  EXPECT_EQ(m_.GetNumDatabases(), before_) << "the database went with its last text";
+  // By handle: the last holder of all the handle's texts ends it; so does a text unknown.
+  ASSERT_EQ(Open("F1", Frame(1)), 0);
+  ASSERT_EQ(Open("F1 again", Frame(1)), 0);
+  ASSERT_EQ(Open("F2", Frame(2)), 0);
+  ASSERT_EQ(Open("F2 alias", Frame(2)), 0);
+  EXPECT_EQ(Release(db_ + 1), kHeld);
+  EXPECT_EQ(Release(db_ + 1, "never opened"), kLast);
+  EXPECT_EQ(Lookup("F1") + Lookup("F1 again"), 0u);
+  // By name: a text's last holder ends the handle, whatever its other texts hold.
+  EXPECT_EQ(Release(db_ + 2, "F2"), kLast);
+  EXPECT_EQ(Lookup("F2 alias"), db_ + 2);
+  EXPECT_EQ(Release(db_ + 2), kUnknown);
 }
 
-TEST_F(DbLife, CreateUnderAKnownTextAddsAHolder) {
-  ASSERT_EQ(Open(T("F1"), {db_ + 1, db_, kFrame, 0}), 0);
-  ASSERT_EQ(Open(T("F1"), {db_ + 1, db_, kFrame, 0}, 0, kDbOpenUndecided), 0);
-  uint32_t last = 9;
-  EXPECT_EQ(ReleaseName(T("F1"), db_ + 1, last), 0);
-  EXPECT_EQ(last, 0u);
-  EXPECT_EQ(ReleaseName(T("F1"), db_ + 1, last), 0);
-  EXPECT_EQ(last, 1u);
-}
-
-TEST_F(DbLife, ReleaseByHandleEndsWhenNoTextOfTheHandleHasHolders) {
-  ASSERT_EQ(Open(T("F1"), {db_ + 1, db_, kFrame, 0}), 0);
-  ASSERT_EQ(Open(T("F1 again"), {db_ + 1, db_, kFrame, 0}), 0);
-  ASSERT_EQ(Open(T("F2"), {db_ + 2, db_, kFrame, 0}), 0);
-  uint32_t last = 9;
-  EXPECT_EQ(ReleaseHandle(db_ + 1, last), 0);
-  EXPECT_EQ(last, 0u);
-  EXPECT_EQ(ReleaseHandle(db_ + 1, last), 0);
-  EXPECT_EQ(last, 1u);
-  EXPECT_EQ(Lookup(T("F1")), 0u);
-  EXPECT_EQ(Lookup(T("F1 again")), 0u);
-  EXPECT_EQ(Lookup(T("F2")), db_ + 2) << "other handles keep their texts";
-  EXPECT_EQ(m_.GetNumDatabases(), databasesBefore_ + 1);
-}
-
-TEST_F(DbLife, UnknownHandles) {
-  const uint32_t unknown = db_ + 0x55;
-  uint32_t last = 9;
-  EXPECT_EQ(ReleaseHandle(unknown, last), kvErrDbObjectNotFound);
-  EXPECT_EQ(last, 1u) << "an unknown handle counts as the last: the caller closes it";
-  last = 9;
-  EXPECT_EQ(ReleaseName(T("F1"), unknown, last), kvErrDbObjectNotFound);
-  EXPECT_EQ(last, 0u);
-  uint32_t count = 9;
-  EXPECT_EQ(m_.BeginWalk(unknown, &count), kvErrDbObjectNotFound);
-  EXPECT_EQ(count, 0u);
-  EXPECT_EQ(m_.RemoveChildren(unknown), kvErrDbObjectNotFound);
-  EXPECT_EQ(m_.RemoveDatabase(unknown), kvErrDbObjectNotFound);
-}
-
-TEST_F(DbLife, ChildOfARemovedDatabaseIsKnownWithoutDatabase) {
-  ASSERT_EQ(Open(T("db"), {db_, db_, 0, 0}), 0);
-  ASSERT_EQ(Open(T("F1"), {db_ + 1, db_, kFrame, 0}), 0);
-  ASSERT_EQ(m_.RemoveDatabase(db_), 0);
-  EXPECT_EQ(m_.GetNumDatabases(), databasesBefore_);
-  EXPECT_EQ(Lookup(T("F1")), 0u);
-  Status begun = 1;
-  EXPECT_TRUE(Walk(db_ + 1, &begun).empty());
-  EXPECT_EQ(begun, 0);
-  uint32_t last = 9;
-  EXPECT_EQ(ReleaseHandle(db_ + 1, last), 0);
-  EXPECT_EQ(last, 1u);
-  EXPECT_EQ(ReleaseName(T("db"), db_, last), 0) << "the database's own entry stayed as well";
-  EXPECT_EQ(last, 1u);
-}
-
-TEST_F(DbLife, OpenKindsOfADatabaseMustAgree) {
-  struct Case {
-    uint32_t first, second, third;
-    Status expected;  // of the third open
-  } cases[] = {
-      {kDbOpenManual, kDbOpenManual, kDbOpenAutomatic, kvErrDatabaseModeConflict},
-      {kDbOpenAutomatic, kDbOpenAutomatic, kDbOpenManual, kvErrDatabaseModeConflict},
-      {kDbOpenUndecided, kDbOpenManual, kDbOpenAutomatic, kvErrDatabaseModeConflict},
-      {kDbOpenUndecided, kDbOpenAutomatic, kDbOpenManual, kvErrDatabaseModeConflict},
-      {kDbOpenUndecided, kDbOpenUndecided, kDbOpenManual, 0},
-      {kDbOpenManual, kDbOpenUndecided, kDbOpenManual, 0},
-      {kDbOpenAutomatic, kDbOpenUndecided, kDbOpenUndecided, 0},
-  };
-  for (const Case &c : cases) {
-    const uint32_t db = FreshDatabase();
-    SCOPED_TRACE(testing::Message() << c.first << c.second << c.third);
-    ASSERT_EQ(Open(T("A"), {db + 1, db, kFrame, 0}, 0, c.first), 0);
-    ASSERT_EQ(Open(T("B"), {db + 2, db, kFrame, 0}, 0, c.second), 0);
-    EXPECT_EQ(Open(T("C"), {db + 3, db, kFrame, 0}, 0, c.third), c.expected);
-    EXPECT_EQ(Lookup(T("C")), c.expected == 0 ? db + 3 : 0u);
-    uint32_t last = 9;
-    EXPECT_EQ(ReleaseHandle(db + 3, last), c.expected == 0 ? 0 : kvErrDbObjectNotFound);
-    ASSERT_EQ(m_.RemoveDatabase(db + 1), 0);
+TEST_F(DbLife, AFailedOpenIsAnErrorObjectOfAKindThatMustAgree) {
+  // Two opens, then a failed one, of one database, by the codes of their kinds (0 automatic,
+  // 1 manual, 2 undecided); '!': the kinds disagree and the third is refused. The error object
+  // made for the failure is closed either way: at once when refused, else at its last release.
+  for (const std::string kinds : {"110!", "001!", "210!", "201!", "221", "121", "022"}) {
+    SCOPED_TRACE(kinds);
+    const bool refused = kinds.size() > 3;
+    kvsimLogClear();
+    for (int i = 0; i < 2; ++i)
+      ASSERT_EQ(Open(std::to_string(i), Frame(i + 1), 0, kinds[i] - '0'), 0);
+    EXPECT_EQ(Open("C", {0, db_, kFrame, 0}, kvsimErrObjectNotFound, kinds[2] - '0'),
+              refused ? kvErrDatabaseModeConflict : 0);
+    const uint32_t error = made_.object;
+    EXPECT_EQ(Lookup("C"), refused ? 0u : error);
+    EXPECT_EQ(Release(error), refused ? kUnknown : kLast);
+    EXPECT_EQ(DriverCalls(), MadeAndClosed(error)) << "the driver's objects are its own";
+    ASSERT_EQ(m_.RemoveDatabase(db_ + 1), 0);
   }
-  EXPECT_EQ(Calls("kvdbCloseDatabase"), 0) << "objects of the driver are left to the caller";
 }
 
-TEST_F(DbLife, RefusedKindClosesTheErrorObjectMadeForIt) {
-  ASSERT_EQ(Open(T("A"), {db_ + 1, db_, kFrame, 0}, 0, kDbOpenManual), 0);
-  kvsimLogClear();
-  tDbObject failed{0, db_, kFrame, 0};
-  cHostText name(T("B"));
-  m_.FindByName(name.Handle(), nullptr);
-  EXPECT_EQ(m_.AddObject(name.Handle(), failed, kvsimErrObjectNotFound, kDbOpenAutomatic),
-            kvErrDatabaseModeConflict);
-  ASSERT_EQ(kvsimLogCount(), 2);
-  kvsimCallRecord made{}, closed{};
-  kvsimLogEntry(0, &made);
-  kvsimLogEntry(1, &closed);
-  EXPECT_STREQ(made.function, "kvhdndbCreateErrorObject");
-  EXPECT_STREQ(closed.function, "kvdbCloseDatabase");
-  EXPECT_EQ(closed.object, made.object);
-  EXPECT_EQ(closed.size1, 1u);
-  EXPECT_EQ(Lookup(T("B")), 0u);
-}
-
-TEST_F(DbLife, FailedOpenIsRegisteredAsAnErrorObject) {
-  kvsimLogClear();
-  tDbObject failed{0, db_, kSignal, 1};
-  cHostText name(T("S1"));
-  m_.FindByName(name.Handle(), nullptr);
-  ASSERT_EQ(m_.AddObject(name.Handle(), failed, kvsimErrObjectNotFound, kDbOpenAutomatic), 0);
-  ASSERT_NE(failed.object, 0u);
-  EXPECT_EQ(failed.isErrorObject, 1u);
-  kvsimCallRecord made{};
-  ASSERT_EQ(kvsimLogEntry(0, &made), 1);
-  EXPECT_STREQ(made.function, "kvhdndbCreateErrorObject");
-  EXPECT_EQ(static_cast<Status>(made.size1), kvsimErrObjectNotFound);
-  EXPECT_EQ(made.object, failed.object);
-  uint32_t size = 0;
-  EXPECT_EQ(kvdbGetPropertySize(failed.object, 0x03000001u, &size), kvsimErrObjectNotFound)
-      << "the failure surfaces at the first use";
-  const std::map<std::string, tDbObject> seen = Walk(failed.object);
-  ASSERT_EQ(seen.count(T("S1")), 1u);
-  EXPECT_EQ(seen.at(T("S1")).isErrorObject, 1u);
-
-  EXPECT_EQ(Lookup(T("S1")), failed.object);
-  uint32_t last = 9;
-  kvsimLogClear();
-  EXPECT_EQ(ReleaseHandle(failed.object, last), 0);
-  EXPECT_EQ(last, 1u);
-  kvsimCallRecord closed{};
-  ASSERT_EQ(kvsimLogEntry(0, &closed), 1);
-  EXPECT_STREQ(closed.function, "kvdbCloseDatabase");
-  EXPECT_EQ(closed.object, failed.object);
-  EXPECT_EQ(closed.size1, 1u);
-  EXPECT_EQ(closed.status, 0);
-  EXPECT_EQ(kvdbGetPropertySize(failed.object, 0x03000001u, &size), kvsimErrInvalidDatabase)
-      << "the error object is gone";
-}
-
-TEST_F(DbLife, ErrorObjectTheDriverRefusesIsTheStatus) {
-  ASSERT_EQ(kvsimFailCall("kvhdndbCreateErrorObject", kvsimErrInvalidArgument, 1), 0);
-  tDbObject failed{0, db_, kFrame, 0};
-  EXPECT_EQ(Open(T("F1"), failed, kvsimErrObjectNotFound), kvsimErrInvalidArgument);
-  EXPECT_EQ(Lookup(T("F1")), 0u);
-  EXPECT_EQ(m_.GetNumDatabases(), databasesBefore_);
-}
-
-TEST_F(DbLife, NothingToRegister) {
-  cHostText empty("");
-  void *nullBlock = nullptr;
-  const struct {
-    SvHandle name;
-    uint32_t database;
-  } cases[] = {{nullptr, db_}, {&nullBlock, db_}, {empty.Handle(), db_}, {nullptr, 0}};
-  for (const auto &c : cases) {
-    m_.FindByName(c.name, nullptr);
-    tDbObject object{db_ + 1, c.database, kFrame, 1};
-    EXPECT_EQ(m_.AddObject(c.name, object, 0, kDbOpenManual), 0);
-    EXPECT_EQ(object.isErrorObject, 0u);
-  }
-  cHostText known(T("F1"));
-  m_.FindByName(known.Handle(), nullptr);
-  tDbObject reopened{db_ + 1, 0, kFrame, 0};
-  EXPECT_EQ(m_.AddObject(known.Handle(), reopened, 0, kDbOpenManual), 0);
-  EXPECT_EQ(m_.GetNumDatabases(), databasesBefore_);
-  EXPECT_EQ(Calls("kvhdndbCreateErrorObject"), 0);
-  uint32_t last = 9;
-  EXPECT_EQ(ReleaseHandle(db_ + 1, last), kvErrDbObjectNotFound);
-}
-
-TEST_F(DbLife, ReleaseByNameEndsTheHandleWhateverItsOtherTexts) {
-  ASSERT_EQ(Open(T("F1"), {db_ + 1, db_, kFrame, 0}), 0);
-  ASSERT_EQ(Open(T("F1 alias"), {db_ + 1, db_, kFrame, 0}), 0);
-  uint32_t last = 9;
-  EXPECT_EQ(ReleaseName(T("F1"), db_ + 1, last), 0);
-  EXPECT_EQ(last, 1u);
-  EXPECT_EQ(Lookup(T("F1 alias")), db_ + 1) << "the other text keeps its holder";
-  EXPECT_EQ(ReleaseHandle(db_ + 1, last), kvErrDbObjectNotFound) << "but the handle is gone";
-  EXPECT_EQ(ReleaseName(T("F1 alias"), db_ + 1, last), kvErrDbObjectNotFound);
-}
-
-TEST_F(DbLife, ReleaseByNameOfAnUnknownTextReleasesByHandle) {
-  ASSERT_EQ(Open(T("F1"), {db_ + 1, db_, kFrame, 0}), 0);
-  uint32_t last = 9;
-  EXPECT_EQ(ReleaseName(T("never opened"), db_ + 1, last), 0);
-  EXPECT_EQ(last, 1u);
-  EXPECT_EQ(Lookup(T("F1")), 0u);
-}
-
-TEST_F(DbLife, RemoveChildrenKeepsTheDatabasesOwnText) {
-  ASSERT_EQ(Open(T("db"), {db_, db_, 0, 0}), 0);
-  ASSERT_EQ(Open(T("F1"), {db_ + 1, db_, kFrame, 0}), 0);
-  tDbObject failed{0, db_, kSignal, 0};
-  ASSERT_EQ(Open(T("S1"), failed, kvsimErrObjectNotFound), 0);
-  const uint32_t errorObject = Lookup(T("S1"));
-  ASSERT_NE(errorObject, 0u);
-  kvsimLogClear();
+TEST_F(DbLife, WalkAndRemovals) {
+  ASSERT_EQ(Open("db", {db_, db_, 0, 0}), 0);
+  ASSERT_EQ(Open("F1\ndb", Frame(1)), 0);
+  ASSERT_EQ(Open("S1", {0, db_, 0x30000, 0}, kvsimErrObjectNotFound), 0);
+  const uint32_t error = made_.object;
+  EXPECT_EQ(Walk(db_ + 1), tSeen({{T("db"), {db_, db_, 0, 0}},
+                                  {T("F1\ndb"), {db_ + 1, db_, kFrame, 0}},
+                                  {T("S1"), {error, db_, 0x30000, 1}}}));
   ASSERT_EQ(m_.RemoveChildren(db_), 0);
-  EXPECT_EQ(kvsimCountCalls("kvdbCloseDatabase"), 1) << "the error object, and only it";
-  const std::map<std::string, tDbObject> seen = Walk(db_);
-  ASSERT_EQ(seen.size(), 1u);
-  EXPECT_EQ(seen.begin()->first, T("db"));
-  uint32_t last = 9;
-  EXPECT_EQ(ReleaseHandle(db_ + 1, last), kvErrDbObjectNotFound);
-  EXPECT_EQ(ReleaseHandle(errorObject, last), kvErrDbObjectNotFound);
-  EXPECT_EQ(ReleaseHandle(db_, last), 0);
-  EXPECT_EQ(last, 1u);
-}
-
-TEST_F(DbLife, WalkListsEveryTextWithItsObject) {
-  const std::map<std::string, tDbObject> opened = {
-      {T("db"), {db_, db_, 0, 0}},
-      {T("F1\ndb"), {db_ + 1, db_, kFrame, 0}},
-      {T("S1\ndb"), {db_ + 2, db_, kSignal, 0}},
-  };
-  for (const auto &entry : opened) ASSERT_EQ(Open(entry.first, entry.second), 0);
-  const std::map<std::string, tDbObject> seen = Walk(db_ + 2);
-  ASSERT_EQ(seen.size(), opened.size());
-  for (const auto &entry : opened) {
-    SCOPED_TRACE(entry.first);
-    ASSERT_EQ(seen.count(entry.first), 1u);
-    const tDbObject &got = seen.at(entry.first);
-    EXPECT_EQ(std::tie(got.object, got.database, got.objectClass, got.isErrorObject),
-              std::tie(entry.second.object, entry.second.database, entry.second.objectClass,
-                       entry.second.isErrorObject));
-  }
+  EXPECT_EQ(DriverCalls(), MadeAndClosed(error)) << "the error object, and it alone, closed";
+  EXPECT_EQ(Walk(db_), tSeen({{T("db"), {db_, db_, 0, 0}}})) << "the database's own text stays";
+  EXPECT_EQ(Release(db_ + 1), kUnknown);
+  EXPECT_EQ(Release(error), kUnknown);
+  // A removed database leaves its objects known, and each release of them is the last.
+  ASSERT_EQ(Open("F2", Frame(2)), 0);
+  ASSERT_EQ(m_.RemoveDatabase(db_ + 2), 0);
+  EXPECT_EQ(m_.GetNumDatabases(), before_);
+  EXPECT_EQ(Walk(db_ + 2), tSeen());
+  EXPECT_EQ(Release(db_ + 2), kLast);
+  EXPECT_EQ(Release(db_, "db"), kLast);
 }
 
 TEST_F(DbLife, WalkSurvivesReleasesOnItsOwnThread) {
-  // Unregistering the host's references during a walk runs their closes on the walking thread:
-  // here the first entry's close takes every other text, the one under the cursor among them,
-  // and then the last text with the database.
-  const std::map<std::string, uint32_t> opened = {
-      {T("db"), db_}, {T("F1"), db_ + 1}, {T("F2"), db_ + 2}, {T("S1"), db_ + 3}};
-  for (const auto &entry : opened) ASSERT_EQ(Open(entry.first, {entry.second, db_, kFrame, 0}), 0);
+  // A close that unregistering runs on the walking thread may take texts, the one under the
+  // cursor among them, or the whole database: here the first text's close takes every other
+  // text, then the last one ends the database.
+  for (uint32_t i = 0; i < 4; ++i) ASSERT_EQ(Open(std::to_string(i), Frame(i)), 0);
   uint32_t count = 0;
+  tDbObject first, next;
   ASSERT_EQ(m_.BeginWalk(db_, &count), 0);
-  ASSERT_EQ(count, 4u);
-  tDbObject first;
-  std::string firstName;
-  ASSERT_EQ(m_.NextInWalk(&first, &firstName), 0);
-  uint32_t last = 9;
-  for (const auto &entry : opened) {
-    if (entry.first == firstName) continue;
-    EXPECT_EQ(ReleaseName(entry.first, entry.second, last), 0);
-    EXPECT_EQ(last, 1u);
+  ASSERT_EQ(m_.NextInWalk(&first, nullptr), 0);
+  for (uint32_t i = 0; i < 4; ++i) {
+    if (db_ + i == first.object) continue;
+    EXPECT_EQ(Release(db_ + i, std::to_string(i).c_str()), kLast) << i;
   }
-  tDbObject next{1, 1, 1, 1};
   EXPECT_EQ(m_.NextInWalk(&next, nullptr), 0);
   EXPECT_EQ(next.object, 0u) << "nothing is left after the cursor";
-  EXPECT_EQ(ReleaseHandle(first.object, last), 0);
-  EXPECT_EQ(last, 1u);
-  EXPECT_EQ(m_.NextInWalk(&next, nullptr), 0) << "the walked database is gone";
-  EXPECT_EQ(next.object, 0u);
+  EXPECT_EQ(Release(first.object), kLast);
+  EXPECT_EQ(m_.NextInWalk(&first, nullptr), 0);
+  EXPECT_EQ(first.object, 0u) << "the walked database is gone";
   EXPECT_EQ(m_.EndWalk(), 0);
-  EXPECT_EQ(m_.GetNumDatabases(), databasesBefore_);
+  EXPECT_EQ(m_.GetNumDatabases(), before_);
 }
 
-TEST_F(DbLife, MisuseIsReportedAsInternal) {
+TEST_F(DbLife, UnknownHandlesTextlessOpensAndMisuse) {
+  uint32_t count = 9;
+  for (Status s :
+       {m_.BeginWalk(db_ + 5, &count), m_.RemoveChildren(db_ + 5), m_.RemoveDatabase(db_ + 5)})
+    EXPECT_EQ(s, kvErrDbObjectNotFound);
+  EXPECT_EQ(count, 0u);
+  EXPECT_EQ(Release(db_ + 5), kUnknown) << "the caller closes it at the driver";
+  EXPECT_EQ(Release(db_ + 5, "F1"), tRelease(kvErrDbObjectNotFound, 0));
+  const auto empty = HostText("");
+  void *nullBlock = nullptr;
+  for (SvHandle name : {SvHandle(), SvHandle(&nullBlock), empty.get()}) {
+    m_.FindByName(name, nullptr);
+    tDbObject object{db_ + 1, db_, kFrame, 1};
+    EXPECT_EQ(m_.AddObject(name, object, 0, kDbOpenManual), 0) << "no text, nothing registered";
+    EXPECT_EQ(object.isErrorObject, 0u);
+  }
+  ASSERT_EQ(kvsimFailCall("kvhdndbCreateErrorObject", kvsimErrInvalidArgument, 1), 0);
+  EXPECT_EQ(Open("F1", {0, db_, kFrame, 0}, kvsimErrObjectNotFound), kvsimErrInvalidArgument)
+      << "an error object that the driver refuses is the open's status";
+  EXPECT_EQ(m_.GetNumDatabases(), before_);
+
   kvsvtest::cFakeErrorLog log;
   tDbObject object{1, 1, 1, 1};
-  std::string name = "x";
-  EXPECT_EQ(m_.NextInWalk(&object, &name), kvErrInternal);
+  EXPECT_EQ(m_.NextInWalk(&object, nullptr), kvErrInternal) << "no walk is open";
   EXPECT_EQ(object.object, 0u);
-
-  ASSERT_EQ(Open(T("F1"), {db_ + 1, db_, kFrame, 0}), 0);
-  cHostText text(T("F1"));
-  m_.FindByName(text.Handle(), nullptr);
-  tDbObject noObject{0, db_, kFrame, 0};
-  EXPECT_EQ(m_.AddObject(text.Handle(), noObject, kvsimErrObjectNotFound, 0), kvErrInternal);
-
-  const auto records = log.Records();
-  ASSERT_EQ(records.size(), 2u);
-  const struct {
-    uint32_t line;
-    uint32_t info;
-  } expected[] = {{577, 0}, {189, static_cast<uint32_t>(kvsimErrObjectNotFound)}};
-  for (size_t i = 0; i < 2; ++i) {
-    EXPECT_EQ(records[i].value.Component(), 13u);
-    EXPECT_EQ(records[i].value.File(), 18u);
-    EXPECT_EQ(records[i].value.Line(), expected[i].line);
-    EXPECT_EQ(records[i].value.info, expected[i].info);
-  }
+  ASSERT_EQ(Open("F1", Frame(1)), 0);
+  EXPECT_EQ(Open("F1", {0, db_, kFrame, 0}, kvsimErrObjectNotFound), kvErrInternal)
+      << "a known text's open gave no object";
+  std::vector<std::array<uint32_t, 4>> got;  // component, file, line, info
+  for (const auto &r : log.Records())
+    got.push_back({r.value.Component(), r.value.File(), r.value.Line(), r.value.info});
+  const auto status = static_cast<uint32_t>(kvsimErrObjectNotFound);
+  EXPECT_EQ(got, (std::vector<std::array<uint32_t, 4>>{{13, 18, 577, 0}, {13, 18, 189, status}}));
 }
 
 }  // namespace
