@@ -7,14 +7,18 @@
 #include <gtest/gtest.h>
 
 #include <deque>
+#include <functional>
 #include <mutex>
 #include <string>
+#include <vector>
 
 #include "kvorproperties.h"
 #include "kvsim.h"
 #include "kvsvapi.h"
 #include "kvsvplatform.h"
 #include "session/session_manager.h"
+#include "support/fake_error_log.h"
+#include "support/session_helpers.h"
 #include "support/slot_fixture.h"
 #include "svsim.h"
 
@@ -23,6 +27,13 @@ constexpr char kBusBoxCanLin[] = "___kvorDev#fff0b8ed";       // serial 1001234
 constexpr char kBusBoxFlexRayEnet[] = "___kvorDev#fff0b8ec";  // serial 1001235
 constexpr int32_t kNotFound = static_cast<int32_t>(0xBFF6308A);
 constexpr int32_t kRefused = static_cast<int32_t>(0xBFF62099);
+
+// The lines of the reports that `log` holds, in their order.
+inline std::vector<uint32_t> ReportLines(const kvsvtest::cFakeErrorLog &log) {
+  std::vector<uint32_t> lines;
+  for (const auto &record : log.Records()) lines.push_back(record.value.Line());
+  return lines;
+}
 
 class SessionFixture : public SlotFixture {
  protected:
@@ -51,20 +62,27 @@ class SessionFixture : public SlotFixture {
 
   // What the host does after an open by name: it registers the reference under that name.
   static SvRefnum HostRef(const char *name, uint32_t handle, bool device) {
-    const char *texts[] = {name,
-                           "kvor",
-                           device ? "KVOR Device" : "KVOR Interface",
-                           "kvsvapi.*",
-                           device ? "kvsvDeviceOpen" : "kvsvInterfaceOpen",
-                           device ? "kvsvDeviceClose" : "kvsvInterfaceClose"};
+    const std::string kind = device ? "Device" : "Interface";
+    const std::string texts[] = {
+        name, "kvor", "KVOR " + kind, "kvsvapi.*", "kvsv" + kind + "Open", "kvsv" + kind + "Close"};
     SvHandle h[6];
-    for (int i = 0; i < 6; ++i) h[i] = svsimMakeString(texts[i]);
+    for (int i = 0; i < 6; ++i) h[i] = svsimMakeString(texts[i].c_str());
     SvRefnum cookie = 0;
-    EXPECT_EQ(svRegisterRefKind3(h[0], handle, h[1], h[2], 21, &cookie, 8, h[3], 1, h[4], h[5], 0,
-                                 0, 0),
-              0);
+    EXPECT_EQ(
+        svRegisterRefKind3(h[0], handle, h[1], h[2], 21, &cookie, 8, h[3], 1, h[4], h[5], 0, 0, 0),
+        0);
     for (SvHandle x : h) svDisposeHandle(x);
     return cookie;
+  }
+
+  // The driver's calls since its log was last cleared: function, object, first size and text.
+  static std::vector<std::string> DriverCalls() {
+    std::vector<std::string> calls;
+    kvsimCallRecord r;
+    for (int32_t i = 0; kvsimLogEntry(i, &r) == 1; ++i)
+      calls.push_back(std::string(r.function) + " " + std::to_string(r.object) + " " +
+                      std::to_string(r.size1) + " " + r.text);
+    return calls;
   }
 
   static bool HostHasRef(SvRefnum cookie) {
