@@ -1,19 +1,18 @@
-// Shared pieces of the signal tests: host arrays of XY clusters as a host program makes and reads
-// them (per signal, the handle of its timestamp array, then the handle of its value array), and
-// the driver calls that the stand-in logged.
+// The signal tests' fixture, and host arrays as a host program makes and reads them: arrays of
+// values, and arrays of XY clusters (per signal, the handle of its timestamp array, then the
+// handle of its value array).
 #ifndef KVSVAPI_TESTS_SIGNAL_SIGNAL_TEST_SUPPORT_H
 #define KVSVAPI_TESTS_SIGNAL_SIGNAL_TEST_SUPPORT_H
 
 #include <gtest/gtest.h>
 
+#include <climits>
 #include <cstring>
-#include <string>
+#include <tuple>
 #include <vector>
 
-#include "kvsim.h"
-#include "kvsvapi.h"
-#include "kvsvplatform.h"
-#include "svsim.h"
+#include "support/call_log.h"
+#include "support/slot_fixture.h"
 
 namespace kvsvtest {
 
@@ -24,12 +23,6 @@ struct tXY {
   std::vector<double> values;
   bool operator==(const tXY &o) const { return times == o.times && values == o.values; }
 };
-
-inline uint64_t RawTime(const SvTime &time) {
-  uint64_t raw = 0;
-  kvsvSvTimeToRawTime(&raw, &time);
-  return raw;
-}
 
 inline int32_t Count(SvHandle array) { return *static_cast<int32_t *>(*array); }
 
@@ -50,8 +43,8 @@ std::vector<T> ReadArray(SvHandle array) {
 }
 
 inline SvHandle *Element(SvHandle clusters, size_t signal, bool values) {
-  char *cluster = static_cast<char *>(*clusters) + 8 + signal * 16;
-  return reinterpret_cast<SvHandle *>(cluster + (values ? 8 : 0));
+  return reinterpret_cast<SvHandle *>(static_cast<char *>(*clusters) + 8 + signal * 16 +
+                                      (values ? 8 : 0));
 }
 
 inline SvHandle MakeClusters(const std::vector<tXY> &signals) {
@@ -70,7 +63,7 @@ inline std::vector<tXY> ReadClusters(SvHandle clusters) {
   std::vector<tXY> signals(static_cast<size_t>(Count(clusters)));
   for (size_t i = 0; i < signals.size(); ++i) {
     for (const SvTime &time : ReadArray<SvTime>(*Element(clusters, i, false))) {
-      signals[i].times.push_back(RawTime(time));
+      kvsvSvTimeToRawTime(&signals[i].times.emplace_back(), &time);
     }
     signals[i].values = ReadArray<double>(*Element(clusters, i, true));
   }
@@ -88,23 +81,53 @@ inline void DisposeClusters(SvHandle clusters) {
   svDisposeHandle(clusters);
 }
 
+// Host handles made, resized and disposed of since the host stand-in's counters were reset.
+inline std::tuple<uint64_t, uint64_t, uint64_t> HostCounts() {
+  return {svsimAllocCount(), svsimResizeCount(), svsimFreeCount()};
+}
+
+// The two sizes of the latest driver call of `function` (of any, for null).
+inline std::pair<uint32_t, uint32_t> Sizes(const char *function = nullptr) {
+  const kvsimCallRecord call = LastCall(function);
+  return {call.size1, call.size2};
+}
+
 // Failures to arm before a call, for tables of failure cases.
 inline void NoFailure() {}
 inline void FailSignalCount() {
   kvsimFailProperty("kvGetProperty", kvPropSession_NumInList, kDriverFault, 1);
 }
 inline void FailFirstAllocation() { svsimFailAllocAt(1); }
+inline void FailFirstResize() { svsimFailResizeAt(1); }
 inline void FailFirstLock() { svsimFailWaveformLockAt(1); }
 
-// The latest logged call of `function`.
-inline kvsimCallRecord LastCall(const char *function) {
-  kvsimCallRecord record{};
-  for (int32_t i = kvsimLogCount() - 1; i >= 0; --i) {
-    if (kvsimLogEntry(i, &record) == 1 && std::string(record.function) == function) return record;
+// Sessions with slots, and the host arrays of a test, disposed of at its end: the value array
+// `values_`, the clusters `clusters_` and every waveform array made by Waveforms. The host stand-in
+// stops the process on a waveform array left locked.
+class SignalTest : public SlotFixture {
+ protected:
+  void TearDown() override {
+    if (values_ != nullptr) svDisposeHandle(values_);
+    DisposeClusters(clusters_);
+    for (SvWaveformArray *array : waveforms_) svsimDisposeWaveformArray(array);
+    EXPECT_EQ(svsimStrayWaveformUnlocks(), strayUnlocks_);
+    SlotFixture::TearDown();
   }
-  ADD_FAILURE() << "no call of " << function;
-  return record;
-}
+  // A session whose reads the driver fills whatever they are given.
+  uint32_t Filling(const char *list, uint32_t mode) {
+    const uint32_t session = MakeSession(list, mode);
+    EXPECT_EQ(kvsimSetSignalReadFill(session, INT32_MAX), 0);
+    return session;
+  }
+  SvWaveformArray *Waveforms(int32_t count = 0, int32_t samples = 0) {
+    return waveforms_.emplace_back(svsimMakeWaveformArray(count, samples));
+  }
+
+  SvHandle values_ = nullptr;
+  SvHandle clusters_ = nullptr;
+  std::vector<SvWaveformArray *> waveforms_;
+  uint64_t strayUnlocks_ = 0;  // unlocks after a failed Lock that a test expects
+};
 
 }  // namespace kvsvtest
 

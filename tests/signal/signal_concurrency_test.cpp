@@ -1,0 +1,77 @@
+// Signal reads from several threads. A second caller never waits on a session in use: it fails at
+// once. A read blocked in the driver ends with the host's end of the program, which runs the abort
+// that the read registered: the read returns the driver's status, the slot goes, and the host data
+// are left consistent.
+#include <atomic>
+#include <functional>
+#include <thread>
+
+#include "signal/signal_test_support.h"
+#include "support/session_helpers.h"
+
+namespace {
+
+using namespace kvsvtest;
+
+TEST_F(SignalTest, RacingReadersGetValuesOrBusyAndNothingElse) {
+  const uint32_t session = MakeSession("A,B,C,D", kvMode_SignalInSinglePoint);
+  const std::vector<double> published = {1, 2, 3, 4};
+  ASSERT_EQ(kvsimSetSignalValues(session, published.data(), 4), 4);
+  std::atomic<int> successes{0}, unexpected{0};
+  std::vector<std::thread> threads;
+  for (int t = 0; t < 4; ++t) {
+    threads.emplace_back([&] {
+      SvHandle values = nullptr;
+      for (int i = 0; i < 300; ++i) {
+        const kvsvStatus status = kvsvReadSignalSinglePoint(session, &values);
+        successes += status == 0;
+        unexpected +=
+            status == 0 ? ReadArray<double>(values) != published : status != kvErrSessionBusy;
+      }
+      svDisposeHandle(values);
+    });
+  }
+  for (std::thread &t : threads) t.join();
+  EXPECT_EQ(unexpected.load(), 0);
+  EXPECT_GT(successes.load(), 0);
+  EXPECT_EQ(Slot(session)->guard.load(), 0u);
+}
+
+// An XY read with a time limit (the clock stays at 0, so nothing else ends its wait), and a
+// waveform read, which waits with the array locked. A second caller meanwhile is refused.
+TEST_F(SignalTest, ReadsBlockedInTheDriverEndWithTheProgram) {
+  const SvTime limit{0, 60};
+  SvWaveformArray *array = Waveforms();
+  const struct {
+    uint32_t mode;
+    const char *blocked;
+    std::function<kvsvStatus(uint32_t)> read;
+  } cases[] = {
+      {kvMode_SignalInXY, "kvReadSignalXY",
+       [&](uint32_t session) { return kvsvReadSignalXY(session, 4, &limit, &clusters_); }},
+      {kvMode_SignalInWaveform, "kvhdnReadSignalWaveform",
+       [&](uint32_t session) { return kvsvReadSignalWaveform(session, 5, array, -1.0); }},
+  };
+  for (const auto &c : cases) {
+    SCOPED_TRACE(c.blocked);
+    const uint32_t session = MakeSession("A,B", c.mode);
+    kvsvStatus status = 0;
+    std::thread reading([&] { status = c.read(session); });
+    ASSERT_EQ(kvsimWaitBlocked(c.blocked, 1), 1);
+    EXPECT_EQ(c.read(session), kvErrSessionBusy);
+    EXPECT_EQ(svsimWaveformLocked(array), c.mode == kvMode_SignalInWaveform ? 1 : 0);
+    SvsimEndReport report{};
+    ASSERT_EQ(svsimEndProgram(&report), 0);
+    EXPECT_EQ(report.cleanupsRun, 1);
+    reading.join();
+    EXPECT_EQ(status, kvsimErrSessionCleared);
+    EXPECT_FALSE(HasSlot(session));
+  }
+  EXPECT_EQ(Count(clusters_), 2);  // filled from the regions, as after any failed driver read
+  // The waveforms are unlocked, and cut to what the driver gave.
+  EXPECT_EQ(svsimWaveformLocked(array), 0);
+  EXPECT_EQ(svsimWaveformCount(array), 2);
+  EXPECT_EQ(svsimWaveformRead(array, 0, nullptr, 0, nullptr, nullptr), 0);
+}
+
+}  // namespace
