@@ -1,23 +1,23 @@
-// A directory of the test's own under the system's temporary directory, removed with its content.
-#ifndef KVSVAPI_TESTS_DIAGNOSTICS_TEMP_DIR_H
-#define KVSVAPI_TESTS_DIAGNOSTICS_TEMP_DIR_H
+// A directory of the test's own under the system's temporary directory, removed with its content,
+// and the reading and patching of the files that a test finds there.
+#ifndef KVSVAPI_TESTS_TEMP_DIR_H
+#define KVSVAPI_TESTS_TEMP_DIR_H
 
 #include <cstdlib>
+#include <filesystem>
 #include <fstream>
 #include <iterator>
 #include <stdexcept>
 #include <string>
-#include <filesystem>
 
 namespace kvsvtest {
 
 class cTempDir {
  public:
-  cTempDir() {
-    std::string pattern = (std::filesystem::temp_directory_path() / "kvsvdiag.XXXXXX").string();
-    if (mkdtemp(pattern.data()) == nullptr) throw std::runtime_error("mkdtemp failed");
-    path_ = pattern;
+  cTempDir() : path_((std::filesystem::temp_directory_path() / "kvsvtest.XXXXXX").string()) {
+    if (mkdtemp(path_.data()) == nullptr) throw std::runtime_error("mkdtemp failed");
   }
+  // A test may have taken the owner's rights away.
   ~cTempDir() {
     std::error_code ignored;
     std::filesystem::permissions(path_, std::filesystem::perms::owner_all, ignored);
@@ -25,7 +25,6 @@ class cTempDir {
   }
   cTempDir(const cTempDir &) = delete;
   cTempDir &operator=(const cTempDir &) = delete;
-
   const std::string &Path() const { return path_; }
 
  private:
