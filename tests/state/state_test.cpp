@@ -80,7 +80,7 @@ TEST_F(StateTest, CommunicationStatesAreUnpackedFieldByFieldWhateverTheStatus) {
   } cases[] = {
       {can, kvState_CANComm, {0x12340531}, 0, {1, 5, 0x12, 0x34, 1, 1}},
       {can, kvState_CANComm, {0xFEDCBA98}, 0xCAFE0001, {8, 10, 0xFE, 0xDC, 1, 0}},
-      {lin, kvState_LINComm, {0x4E6B3C49, 0x335A}, 7, {2, 4, 60, 0x6B, 14, 0, 0, 0x5A}},
+      {lin, kvState_LINComm, {0x4E6B3C4B, 0x335A}, 7, {2, 4, 60, 0x6B, 14, 1, 0, 0x5A}},
       {lin, kvState_LINComm, {0xC7A5B3DE, 0x01}, 0, {3, 13, 0xB3, 0xA5, 7, 1, 1, 1}},
       {flexRay, kvState_FlexRayComm, {0xFFFFBEEF}, 0, {15, 14, 0x1E, 1, 0}},
       {flexRay, kvState_FlexRayComm, {0x5A3C}, 0xCAFE0001, {12, 3, 0x1A, 0, 1}},
