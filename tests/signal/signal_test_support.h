@@ -73,10 +73,9 @@ inline std::vector<tXY> ReadClusters(SvHandle clusters) {
 // Disposes of the clusters and of every element handle that the outer handle's size holds.
 inline void DisposeClusters(SvHandle clusters) {
   if (clusters == nullptr) return;
-  for (size_t i = 0; i < (svGetHandleSize(clusters) - 8) / 16; ++i) {
-    for (bool values : {false, true}) {
-      if (*Element(clusters, i, values) != nullptr) svDisposeHandle(*Element(clusters, i, values));
-    }
+  SvHandle *elements = Element(clusters, 0, false);
+  for (size_t i = 0; i < (svGetHandleSize(clusters) - 8) / 8; ++i) {
+    if (elements[i] != nullptr) svDisposeHandle(elements[i]);
   }
   svDisposeHandle(clusters);
 }
