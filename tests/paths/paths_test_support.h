@@ -1,25 +1,24 @@
-// Temporary directories and scoped environment variables for the path tests.
+// A temporary directory with files in it, and scoped environment variables, as the driver
+// stand-in's and the session tests use them.
 #ifndef KVSVAPI_TESTS_PATHS_PATHS_TEST_SUPPORT_H
 #define KVSVAPI_TESTS_PATHS_PATHS_TEST_SUPPORT_H
 
 #include <stdlib.h>
-#include <sys/stat.h>
 
 #include <filesystem>
 #include <fstream>
-#include <optional>
 #include <stdexcept>
 #include <string>
+
+#include "support/scoped_env.h"
 
 namespace kvsvtest {
 
 // A fresh directory under /tmp, removed with everything in it at the end of the scope.
 class cTempDir {
  public:
-  cTempDir() {
-    char pattern[] = "/tmp/kvsv_paths_XXXXXX";
-    if (mkdtemp(pattern) == nullptr) throw std::runtime_error("mkdtemp failed");
-    path_ = pattern;
+  cTempDir() : path_("/tmp/kvsv_paths_XXXXXX") {
+    if (mkdtemp(path_.data()) == nullptr) throw std::runtime_error("mkdtemp failed");
   }
   ~cTempDir() {
     std::error_code ignored;
@@ -36,35 +35,6 @@ class cTempDir {
 
  private:
   std::string path_;
-};
-
-inline bool IsDirectory(const std::string &path) {
-  struct stat info;
-  return stat(path.c_str(), &info) == 0 && S_ISDIR(info.st_mode);
-}
-
-// Sets (or with nullopt unsets) an environment variable and restores it at the end of the scope.
-class cScopedEnv {
- public:
-  cScopedEnv(const char *name, std::optional<std::string> value) : name_(name) {
-    if (const char *old = getenv(name)) old_ = old;
-    Apply(value);
-  }
-  ~cScopedEnv() { Apply(old_); }
-  cScopedEnv(const cScopedEnv &) = delete;
-  cScopedEnv &operator=(const cScopedEnv &) = delete;
-
- private:
-  void Apply(const std::optional<std::string> &value) {
-    if (value) {
-      setenv(name_.c_str(), value->c_str(), 1);
-    } else {
-      unsetenv(name_.c_str());
-    }
-  }
-
-  std::string name_;
-  std::optional<std::string> old_;
 };
 
 }  // namespace kvsvtest

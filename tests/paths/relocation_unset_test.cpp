@@ -1,6 +1,5 @@
 // The relocation library present but relocating nothing: every key keeps its default.
 #include <gtest/gtest.h>
-
 #include <stdlib.h>
 
 #include "paths/path_maker.h"
