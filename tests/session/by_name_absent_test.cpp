@@ -6,8 +6,7 @@
 #include <string>
 
 #include "session/kvorutility.h"
-#include "support/fake_error_log.h"
-#include "svsim.h"
+#include "support/session_fixture.h"
 
 namespace {
 
@@ -22,13 +21,12 @@ TEST(UnregisterByName, AMissingHostOperationIsReportedAndLookedForAgain) {
   const std::string text = "___kvorDev#ffeeddcc";
   for (int call = 0; call < 2; ++call)
     EXPECT_EQ(UnregisterReferenceByName(kClassDevice, &text), kvErrInternal);
-  for (const auto &record : log.Records())
-    EXPECT_EQ(std::make_pair(record.value.File(), record.value.Line()), std::make_pair(16u, 2618u));
+  EXPECT_EQ(ReportLines(log), (std::vector<uint32_t>{2618, 2618}));
   EXPECT_EQ(svsimRefCount(), 1);
   ASSERT_NE(dlopen(KVSV_BY_NAME_LIBRARY, RTLD_NOW | RTLD_GLOBAL), nullptr) << dlerror();
   EXPECT_EQ(UnregisterReferenceByName(kClassDevice, &text), 0);
   EXPECT_EQ(svsimRefCount(), 0);
-  EXPECT_EQ(log.Records().size(), 2u);
+  EXPECT_EQ(ReportLines(log).size(), 2u) << "found: nothing more to report";
   svDisposeHandle(name);
 }
 

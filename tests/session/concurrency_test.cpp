@@ -13,7 +13,6 @@
 #include <thread>
 #include <tuple>
 
-#include "session/object_class.h"
 #include "session/system_manager.h"
 #include "support/session_fixture.h"
 
@@ -47,7 +46,6 @@ TEST_F(Concurrency, ABlockedReadReturnsBeforeTheSlotIsFreed) {
     EXPECT_EQ(status, kvsimErrSessionCleared);
     EXPECT_EQ(Slot(made.handle), nullptr);
     EXPECT_EQ(kvsimOpenSessionCount(), 0);
-    EXPECT_EQ(kvsvReadSignalSinglePoint(made.handle, &values), kvErrInvalidSession);
     kvsimRelease("kvReadSignalSinglePoint");
     Keep(values);
     svsimEndProgram(nullptr);
@@ -57,7 +55,6 @@ TEST_F(Concurrency, ABlockedReadReturnsBeforeTheSlotIsFreed) {
 TEST_F(Concurrency, AbortOfAnErrorHandleFreesItsGuardAndItsErrorChild) {
   uint32_t device = 0;
   ASSERT_EQ(OpenDevice("NoSuchDevice", &device), 0);
-  ASSERT_EQ(ClassFromHandle(static_cast<int32_t>(device)), kClassSession);
   ASSERT_EQ(PlaceSlot(device), 0);
   Slot(device)->guard = 1;  // a call in progress on the error handle
   EXPECT_EQ(kvsvSessionAbort(device), 0);
@@ -155,7 +152,6 @@ TEST_F(Concurrency, ParallelOpensAndClosesOfSystemObjectsComeOutEven) {
   EXPECT_EQ(kvsvGetSystemRefCount(), 0u);
   EXPECT_EQ(kvsimOpenSystemCount(), 0);
   EXPECT_EQ(kvsimCountCalls("kvSystemOpen"), kvsimCountCalls("kvSystemClose"));
-  EXPECT_EQ(svsimRefCount(), 0);
 }
 
 TEST_F(Concurrency, ErrorChildrenKeepTheirAcquiresUnderContention) {
