@@ -2,6 +2,7 @@
 // the cache that keeps a steady loop free of property reads and allocations, and what every
 // failure leaves behind.
 #include "signal/signal_test_support.h"
+#include "support/tesla_signals.h"
 
 namespace {
 
@@ -68,7 +69,7 @@ TEST_F(SignalTest, XYReadsFillOneClusterPerSignalAndSteadyOnesCostNothing) {
   DisposeClusters(other);
 }
 
-TEST_F(SignalTest, XYReadFailuresEmptyTheArraysOrKeepWhatTheRegionsHold) {
+TEST_F(SignalTest, XYReadFailuresEmptyTheArrays) {
   const uint32_t session = Filling("A,B,C", kvMode_SignalInXY);
   kvsimSetClock(kNow);
   // Each failure of a read that sizes everything again (a longer run: the count, the outer array,
@@ -97,12 +98,7 @@ TEST_F(SignalTest, XYReadFailuresEmptyTheArraysOrKeepWhatTheRegionsHold) {
     EXPECT_EQ(*Element(clusters_, 2, false) == nullptr, c.disposed);
     EXPECT_EQ(Slot(session)->cachedSamples, kUnknown);
   }
-  // A failed driver read leaves the arrays showing what the regions hold. A skipped call does
-  // nothing.
-  ASSERT_EQ(kvsvReadSignalXY(session, samples, nullptr, &clusters_), 0);
-  ASSERT_EQ(kvsimFailCall("kvReadSignalXY", kDriverFault, 1), 0);
-  EXPECT_EQ(kvsvReadSignalXY(session, samples, nullptr, &clusters_), kDriverFault);
-  EXPECT_EQ(ReadClusters(clusters_), Filled(static_cast<uint32_t>(samples)));
+  // A skipped call does nothing.
   const uint8_t skip = 1, go = 0;
   EXPECT_EQ(kvsvReadSignalXYEx(session, 1, nullptr, nullptr, &skip), 0);
   EXPECT_EQ(kvsvReadSignalXYEx(session, 1, nullptr, nullptr, &go), kvErrNullArgument);
@@ -153,6 +149,19 @@ TEST_F(SignalTest, XYWritesSendPairsAsFlatRunsAndFailuresForgetTheCount) {
     EXPECT_EQ(last, c.last);
   }
   EXPECT_EQ(kvsvWriteSignalXY(writer, nullptr, 0.0), kvErrElementCountMismatch);
+  // The times go down with the values: a reader of a database's signal on the other interface
+  // gets the pairs as they were written.
+  const tSignalCase &signal = TeslaSignals()[3];
+  const uint32_t tesla = TeslaSession("CAN1", kvMode_SignalOutXY, signal.name);
+  const uint32_t reader = TeslaSession("CAN2", kvMode_SignalInXY, signal.name);
+  ASSERT_EQ(PlaceSlot(tesla) + PlaceSlot(reader), 0);
+  DisposeClusters(clusters_);
+  clusters_ = MakeClusters({{{kNow, kNow + 7}, {signal.value, signal.value}}});
+  ASSERT_EQ(kvsvWriteSignalXY(tesla, clusters_, 0.0), 0);
+  SvHandle read = nullptr;
+  ASSERT_EQ(kvsvReadSignalXY(reader, 4, nullptr, &read), 0);
+  EXPECT_EQ(ReadClusters(read)[0].times, (std::vector<uint64_t>{kNow, kNow + 7}));
+  DisposeClusters(read);
 }
 
 }  // namespace
