@@ -62,7 +62,7 @@ TEST_F(SessionTable, SlotsOfIndices1To8192AdmitOneCallPerGuardWord) {
     EXPECT_EQ(cSlotGuard(0x2000u).status(), kvErrSessionBusy);
     // The list guard is its own word: a name lookup runs beside a read.
     cSlotGuard list(0x2000u, &tSessionSlot::listGuard);
-    EXPECT_EQ(slot->listGuard.load(), list ? 1u : 0u);
+    EXPECT_TRUE(list && slot->listGuard.load() == 1u);
   }
   EXPECT_EQ(slot->guard.load() + slot->listGuard.load(), 0u);
   slot->slotValid = 0;  // as a teardown leaves it before it waits for the guards
