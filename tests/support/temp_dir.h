@@ -26,6 +26,10 @@ class cTempDir {
   cTempDir(const cTempDir &) = delete;
   cTempDir &operator=(const cTempDir &) = delete;
   const std::string &Path() const { return path_; }
+  std::string Sub(const std::string &relative) const { return path_ + "/" + relative; }
+  void WriteFile(const std::string &relative, const std::string &content) const {
+    std::ofstream(Sub(relative), std::ios::binary) << content;
+  }
 
  private:
   std::string path_;
