@@ -53,4 +53,24 @@ TEST_F(SignalTest, AReadBlockedInTheDriverEndsWithTheProgram) {
   EXPECT_EQ(Count(clusters_), 2);  // filled from the regions, as after any failed driver read
 }
 
+// A waveform read keeps the host's array locked across the driver call: the end of the program
+// must leave it unlocked and cut to what the driver gave.
+TEST_F(SignalTest, AWaveformReadEndsWithTheProgramAndUnlocksTheArray) {
+  const uint32_t session = MakeSession("A,B", kvMode_SignalInWaveform);
+  SvWaveformArray *waveforms = svsimMakeWaveformArray(0, 0);
+  kvsvStatus status = 0;
+  std::thread reading([&] { status = kvsvReadSignalWaveform(session, 5, waveforms, -1.0); });
+  ASSERT_EQ(kvsimWaitBlocked("kvhdnReadSignalWaveform", 1), 1);
+  EXPECT_EQ(svsimWaveformLocked(waveforms), 1);
+  SvsimEndReport report{};
+  ASSERT_EQ(svsimEndProgram(&report), 0);
+  EXPECT_EQ(report.cleanupsRun, 1);
+  reading.join();
+  EXPECT_EQ(status, kvsimErrSessionCleared);
+  EXPECT_FALSE(HasSlot(session));
+  EXPECT_EQ(svsimWaveformLocked(waveforms), 0);
+  EXPECT_EQ(svsimWaveformCount(waveforms), 2);
+  svsimDisposeWaveformArray(waveforms);
+}
+
 }  // namespace
