@@ -1,5 +1,6 @@
 #include "cleanups.h"
 
+#include <algorithm>
 #include <mutex>
 #include <new>
 
@@ -17,9 +18,19 @@ class CleanupRegistry {
     return *registry;
   }
 
+  // The same procedure with the same argument again replaces the earlier registration, as the
+  // host does: a program that makes blocking calls in a loop holds one registration, not one per
+  // call.
   void Add(const Cleanup &cleanup) {
     std::lock_guard<std::mutex> lock(mutex_);
-    pending_.push_back(cleanup);
+    const auto same = std::find_if(pending_.begin(), pending_.end(), [&](const Cleanup &held) {
+      return held.procedure == cleanup.procedure && held.argument == cleanup.argument;
+    });
+    if (same != pending_.end()) {
+      *same = cleanup;
+    } else {
+      pending_.push_back(cleanup);
+    }
     last_ = cleanup;
     ++registrations_;
   }

@@ -160,7 +160,8 @@ int32_t svsimUnregisterRefByName(SvHandle name, SvHandle kind, SvHandle classNam
 
 /* Calls of svSetCleanupProc since the last reset, whatever ran since. */
 int32_t svsimCleanupRegistrations(void);
-/* Procedures registered and not yet run by an end of program. */
+/* Procedures registered and not yet run by an end of program. A registration of a procedure with
+ * an argument already pending replaces the pending one (its mode taken anew), so it counts once. */
 int32_t svsimPendingCleanups(void);
 /* The last registration since the last reset into the non-null pointers. 1 if there was one. */
 int32_t svsimLastCleanup(SvCleanupProc *procedure, uint64_t *argument, int32_t *mode);
