@@ -35,6 +35,17 @@ TEST_F(SignalTest, RacingReadersGetValuesOrBusyAndNothingElse) {
   EXPECT_GT(successes.load(), 0);
 }
 
+// Ends the program while `reading` is blocked in the driver: the host runs the one abort that the
+// read registered, the read returns the driver's status and the slot is gone.
+void EndProgramUnderRead(std::thread &reading, const kvsvStatus &status, uint32_t session) {
+  SvsimEndReport report{};
+  ASSERT_EQ(svsimEndProgram(&report), 0);
+  EXPECT_EQ(report.cleanupsRun, 1);
+  reading.join();
+  EXPECT_EQ(status, kvsimErrSessionCleared);
+  EXPECT_FALSE(HasSlot(session));
+}
+
 // An XY read with a time limit: the clock stays at 0, so nothing else ends its wait. A second
 // caller meanwhile is refused.
 TEST_F(SignalTest, AReadBlockedInTheDriverEndsWithTheProgram) {
@@ -44,12 +55,7 @@ TEST_F(SignalTest, AReadBlockedInTheDriverEndsWithTheProgram) {
   std::thread reading([&] { status = kvsvReadSignalXY(session, 4, &limit, &clusters_); });
   ASSERT_EQ(kvsimWaitBlocked("kvReadSignalXY", 1), 1);
   EXPECT_EQ(kvsvReadSignalXY(session, 4, &limit, &clusters_), kvErrSessionBusy);
-  SvsimEndReport report{};
-  ASSERT_EQ(svsimEndProgram(&report), 0);
-  EXPECT_EQ(report.cleanupsRun, 1);
-  reading.join();
-  EXPECT_EQ(status, kvsimErrSessionCleared);
-  EXPECT_FALSE(HasSlot(session));
+  EndProgramUnderRead(reading, status, session);
   EXPECT_EQ(Count(clusters_), 2);  // filled from the regions, as after any failed driver read
 }
 
@@ -62,12 +68,7 @@ TEST_F(SignalTest, AWaveformReadEndsWithTheProgramAndUnlocksTheArray) {
   std::thread reading([&] { status = kvsvReadSignalWaveform(session, 5, waveforms, -1.0); });
   ASSERT_EQ(kvsimWaitBlocked("kvhdnReadSignalWaveform", 1), 1);
   EXPECT_EQ(svsimWaveformLocked(waveforms), 1);
-  SvsimEndReport report{};
-  ASSERT_EQ(svsimEndProgram(&report), 0);
-  EXPECT_EQ(report.cleanupsRun, 1);
-  reading.join();
-  EXPECT_EQ(status, kvsimErrSessionCleared);
-  EXPECT_FALSE(HasSlot(session));
+  EndProgramUnderRead(reading, status, session);
   EXPECT_EQ(svsimWaveformLocked(waveforms), 0);
   EXPECT_EQ(svsimWaveformCount(waveforms), 2);
   svsimDisposeWaveformArray(waveforms);
