@@ -142,9 +142,9 @@ int32_t kvConvertFramesToByteArraySinglePoint(uint32_t session, const void *fram
                                               uint32_t bytesSize);
 
 /* Databases. A database is opened by alias, by the path of a database file, or as ":memory:";
- * its objects (cluster, frame, signal, ECU, PDU) are found or created under a parent by class
- * (the class codes of the property identifiers: 0x10000 cluster, 0x20000 frame, 0x30000 signal,
- * 0x50000 ECU, 0x80000 PDU) and name. A signal is found in its frame by name, or in its cluster
+ * its objects are found or created under a parent by class (the class codes of the property
+ * identifiers: 0x10000 cluster, 0x20000 frame, 0x30000 signal, 0x40000 subframe, 0x50000 ECU,
+ * 0x60000 LIN schedule, 0x70000 LIN schedule entry, 0x80000 PDU) and name. A signal is found in its frame by name, or in its cluster
  * as "frame.signal" or by a name that no other frame uses. Every handle of a database, its own
  * or an object's, serves kvdbCloseDatabase: closeAll 0 undoes one open, 1 every open. */
 int32_t kvdbOpenDatabase(const char *name, uint32_t *database);
@@ -152,8 +152,14 @@ int32_t kvdbCloseDatabase(uint32_t database, uint32_t closeAll);
 int32_t kvdbFindObject(uint32_t parent, uint32_t objectClass, const char *name, uint32_t *object);
 int32_t kvdbCreateObject(uint32_t parent, uint32_t objectClass, const char *name,
                          uint32_t *object);
-/* Deletes a cluster, frame (with its signals and PDU), signal or ECU. */
+/* Deletes an object with everything it holds (a frame its signals, subframes and PDU; a LIN
+ * schedule its entries). */
 int32_t kvdbDeleteObject(uint32_t object);
+/* The database that holds `object` (a database gives itself). */
+int32_t kvhdndbGetDatabaseRefFromObjRef(uint32_t object, uint32_t *database);
+/* Tells the driver that one more reference to `handle` exists: its database takes one more open,
+ * which the reference's kvdbCloseDatabase(handle, 0) gives back. */
+int32_t kvhdndbOpenDatabaseByRef(uint32_t handle);
 /* Makes a handle that stands for an open that failed with `status`: calls on it give `status`,
  * and kvdbCloseDatabase ends it. */
 int32_t kvhdndbCreateErrorObject(int32_t status, uint32_t *object);
@@ -164,12 +170,34 @@ int32_t kvdbSetProperty(uint32_t object, uint32_t id, uint32_t size, const void 
 /* Writes the database as a database file at `filePath`, or, if it is null or empty, to the file
  * it was opened from. */
 int32_t kvdbSaveDatabase(uint32_t database, const char *filePath);
-/* Names a database file by an alias; the baud rate serves a file that gives none. */
+/* Copies the cluster `source` with its objects into the cluster `target` of another database.
+ * `copyMode` 0: an object of the same name in the target is replaced; 1: it stays and the
+ * source's is skipped; 2: a name found in both is an error and nothing is copied. `prefix` (may be
+ * null) goes before the name of every frame, ECU and PDU copied. The stand-in completes at once:
+ * `*percentComplete` (may be null) is 100 whatever `waitForComplete`. */
+int32_t kvdbMerge(uint32_t target, uint32_t source, uint32_t copyMode, const char *prefix,
+                  uint32_t waitForComplete, uint32_t *percentComplete);
+/* Copies the database file of `alias` to the target at `ipAddress`, where it is then known by
+ * the same alias; Undeploy removes it there. Completion as for kvdbMerge. */
+int32_t kvdbDeploy(const char *ipAddress, const char *alias, uint32_t waitForComplete,
+                   uint32_t *percentComplete);
+int32_t kvdbUndeploy(const char *ipAddress, const char *alias);
+/* Attributes of a database file (its BA_ values) of a database, ECU, frame or signal, as text.
+ * `mode` 0: the value of attribute `name` (`*isDefault` 1 when the object sets none and the
+ * definition's default is given); 1: the texts of an enumeration attribute `name`, comma-separated;
+ * 2: the names of every attribute defined for the object's class, comma-separated (`name`
+ * unused). Sizes count the NUL. */
+int32_t kvdbGetDBCAttributeSize(uint32_t object, uint32_t mode, const char *name, uint32_t *size);
+int32_t kvdbGetDBCAttribute(uint32_t object, uint32_t mode, const char *name, uint32_t size,
+                            char *value, uint32_t *isDefault);
+/* Names a database file by an alias; the baud rate serves a file that gives none. Aliases are kept
+ * in a file of the driver's configuration directory and outlive the process. */
 int32_t kvdbAddAlias(const char *alias, const char *filePath, uint32_t defaultBaudRate);
 int32_t kvdbAddAlias64(const char *alias, const char *filePath, uint64_t defaultBaudRate);
 int32_t kvdbRemoveAlias(const char *alias);
 /* The aliases and their file paths, as two comma-separated lists in the same order. Sizes count
- * the NUL. `target` 0 is this machine. A list that outgrew the sizes given is
+ * the NUL. `target` 0 is this machine; otherwise it is the address of a target's IP address text,
+ * and the list is what was deployed there. A list that outgrew the sizes given is
  * kvErrDatabaseListChanged. */
 int32_t kvdbGetDatabaseListSizes(uint64_t target, uint32_t *aliasesSize, uint32_t *pathsSize);
 int32_t kvdbGetDatabaseList(uint64_t target, uint32_t aliasesSize, char *aliases,
