@@ -748,6 +748,42 @@ KVSV_EXPORT kvsvStatus kvsvReadStateTimeTrigger(uint32_t session, SvTime *first,
 KVSV_EXPORT kvsvStatus kvsvReadStateFlexRayTime(uint32_t session, uint8_t *cycle,
                                                 uint16_t *macrotick);
 
+/* ---- Database editing ----------------------------------------------------------------------
+ * Operations on whole databases and their files, handed to the driver as they are: the status is
+ * the driver's. A merge copies the cluster `source` into the cluster `target` of another
+ * database (copyMode 0 replaces objects of the same name, 1 keeps the target's, 2 refuses a
+ * clash); save and export write the database of `database` to `filePath` (null or empty: its own
+ * file); an alias names a database file for later opens and outlives the program; deploy copies
+ * the file of an alias to the target at `ipAddress`. */
+KVSV_EXPORT kvsvStatus kvsvdbMerge(uint32_t target, uint32_t source, uint32_t copyMode,
+                                   const char *prefix, uint32_t waitForComplete,
+                                   uint32_t *percentComplete);
+KVSV_EXPORT kvsvStatus kvsvdbSave(uint32_t database, const char *filePath);
+KVSV_EXPORT kvsvStatus kvsvdbExport(uint32_t database, const char *filePath);
+KVSV_EXPORT kvsvStatus kvsvdbAddAlias(const char *alias, const char *filePath,
+                                      uint32_t defaultBaudRate);
+KVSV_EXPORT kvsvStatus kvsvdbAddAlias64(const char *alias, const char *filePath,
+                                        uint64_t defaultBaudRate);
+KVSV_EXPORT kvsvStatus kvsvdbRemoveAlias(const char *alias);
+KVSV_EXPORT kvsvStatus kvsvdbDeploy(const char *ipAddress, const char *alias,
+                                    uint32_t waitForComplete, uint32_t *percentComplete);
+KVSV_EXPORT kvsvStatus kvsvdbUndeploy(const char *ipAddress, const char *alias);
+
+/* The aliases known to `target` (0: this machine; else the address of a target's IP address
+ * text) and their files, as two arrays of strings in the same order. Both arrays are replaced,
+ * their old strings disposed of; with no alias at all both stay as they were. A list that changes
+ * while it is read is read again, up to eleven times in all; after that the status is
+ * 0xBFF6308E. 0xBFF63015 for a null pointer; 0xBFF63010 out of memory. */
+KVSV_EXPORT kvsvStatus kvsvdbGetDatabaseList(uint64_t target, SvHandle *aliases,
+                                             SvHandle *filePaths);
+/* An attribute of the database file that `object` came from, as text, into the string `*value`
+ * (made if null). `mode` 0 the value of attribute `name` (`*isDefault` 1 when only its
+ * definition's default applies), 1 the texts of an enumeration attribute, 2 the names of the
+ * attributes of the object's class, comma-separated. A failed read leaves the string's count as it
+ * was. 0xBFF63015 for a null `value`; 0xBFF63010 out of memory. */
+KVSV_EXPORT kvsvStatus kvsvdbGetDBCAttribute(uint32_t object, uint32_t mode, const char *name,
+                                             SvHandle *value, uint32_t *isDefault);
+
 #ifdef __cplusplus
 }
 #endif

@@ -196,7 +196,7 @@ int32_t kvdbAddAlias(const char *alias, const char *filePath, uint32_t defaultBa
 int32_t kvdbAddAlias64(const char *alias, const char *filePath, uint64_t defaultBaudRate);
 int32_t kvdbRemoveAlias(const char *alias);
 /* The aliases and their file paths, as two comma-separated lists in the same order. Sizes count
- * the NUL. `target` 0 is this machine; otherwise it is the address of a target's IP address text,
+ * the NUL; with no alias at all both are 0. `target` 0 is this machine; otherwise it is the address of a target's IP address text,
  * and the list is what was deployed there. A list that outgrew the sizes given is
  * kvErrDatabaseListChanged. */
 int32_t kvdbGetDatabaseListSizes(uint64_t target, uint32_t *aliasesSize, uint32_t *pathsSize);
