@@ -1,7 +1,8 @@
 // Databases: kvdbOpenDatabase, kvdbCloseDatabase, kvdbFindObject, kvdbCreateObject,
 // kvdbDeleteObject, kvdbGetPropertySize, kvdbGetProperty, kvdbSetProperty, kvdbSaveDatabase,
 // kvdbAddAlias, kvdbAddAlias64, kvdbRemoveAlias, kvdbGetDatabaseListSizes, kvdbGetDatabaseList,
-// kvhdndbCreateErrorObject.
+// kvdbMerge, kvdbDeploy, kvdbUndeploy, kvdbGetDBCAttributeSize, kvdbGetDBCAttribute,
+// kvhdndbCreateErrorObject, kvhdndbGetDatabaseRefFromObjRef, kvhdndbOpenDatabaseByRef.
 #include <cstdio>
 
 #include "driver.h"
@@ -169,5 +170,75 @@ KVOR_DRIVER_API int32_t kvhdndbCreateErrorObject(int32_t status, uint32_t *objec
     const Status made = Driver::Instance().Databases().CreateErrorObject(status, object);
     if (made == 0) call.object = *object;
     return made;
+  });
+}
+
+KVOR_DRIVER_API int32_t kvhdndbGetDatabaseRefFromObjRef(uint32_t object, uint32_t *database) {
+  return RunDriverCall(DatabaseCall("kvhdndbGetDatabaseRefFromObjRef", object), 0,
+                       [&](CallArgs &) -> Status {
+                         return OnObject(object, [&](DatabaseRegistry &databases) {
+                           return databases.DatabaseOf(object, database);
+                         });
+                       });
+}
+
+KVOR_DRIVER_API int32_t kvhdndbOpenDatabaseByRef(uint32_t handle) {
+  return RunDriverCall(DatabaseCall("kvhdndbOpenDatabaseByRef", handle), 0,
+                       [&](CallArgs &) -> Status {
+                         return OnObject(handle, [&](DatabaseRegistry &databases) {
+                           return databases.OpenByRef(handle);
+                         });
+                       });
+}
+
+KVOR_DRIVER_API int32_t kvdbMerge(uint32_t target, uint32_t source, uint32_t copyMode,
+                                  const char *prefix, uint32_t, uint32_t *percentComplete) {
+  CallArgs args = DatabaseCall("kvdbMerge", target, 0, copyMode, prefix);
+  args.size2 = source;
+  return RunDriverCall(args, 0, [&](CallArgs &) -> Status {
+    if (const Status failure = Driver::Instance().Databases().ErrorObjectStatus(source)) {
+      return failure;
+    }
+    return OnObject(target, [&](DatabaseRegistry &databases) {
+      const Status status = databases.Merge(target, source, copyMode, prefix);
+      if (status == 0 && percentComplete != nullptr) *percentComplete = 100;
+      return status;
+    });
+  });
+}
+
+KVOR_DRIVER_API int32_t kvdbDeploy(const char *ipAddress, const char *alias, uint32_t,
+                                   uint32_t *percentComplete) {
+  return RunDriverCall(DatabaseCall("kvdbDeploy", 0, 0, 0, alias), 0, [&](CallArgs &) -> Status {
+    const Status status = Driver::Instance().Databases().Deploy(ipAddress, alias);
+    if (status == 0 && percentComplete != nullptr) *percentComplete = 100;
+    return status;
+  });
+}
+
+KVOR_DRIVER_API int32_t kvdbUndeploy(const char *ipAddress, const char *alias) {
+  return RunDriverCall(DatabaseCall("kvdbUndeploy", 0, 0, 0, alias), 0, [&](CallArgs &) -> Status {
+    return Driver::Instance().Databases().Undeploy(ipAddress, alias);
+  });
+}
+
+KVOR_DRIVER_API int32_t kvdbGetDBCAttributeSize(uint32_t object, uint32_t mode, const char *name,
+                                                uint32_t *size) {
+  return RunDriverCall(DatabaseCall("kvdbGetDBCAttributeSize", object, 0, mode, name), 0,
+                       [&](CallArgs &) -> Status {
+                         return OnObject(object, [&](DatabaseRegistry &databases) {
+                           return databases.GetDbcAttributeSize(object, mode, name, size);
+                         });
+                       });
+}
+
+KVOR_DRIVER_API int32_t kvdbGetDBCAttribute(uint32_t object, uint32_t mode, const char *name,
+                                            uint32_t size, char *value, uint32_t *isDefault) {
+  CallArgs args = DatabaseCall("kvdbGetDBCAttribute", object, 0, mode, name);
+  args.size2 = size;
+  return RunDriverCall(args, 0, [&](CallArgs &) -> Status {
+    return OnObject(object, [&](DatabaseRegistry &databases) {
+      return databases.GetDbcAttribute(object, mode, name, size, value, isDefault);
+    });
   });
 }

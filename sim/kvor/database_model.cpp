@@ -45,4 +45,15 @@ const tSignal *FindMultiplexer(const tFrame &frame) {
   return nullptr;
 }
 
+std::string SubframeName(uint32_t muxValue) { return "m" + std::to_string(muxValue); }
+
+void AddMissingSubframes(tFrame *frame) {
+  for (const tSignal &signal : frame->signals) {
+    if (signal.mux != MuxRole::kMultiplexed) continue;
+    bool known = false;
+    for (const tSubframe &subframe : frame->subframes) known = known || subframe.muxValue == signal.muxValue;
+    if (!known) frame->subframes.push_back(tSubframe{SubframeName(signal.muxValue), signal.muxValue});
+  }
+}
+
 }  // namespace nKvorSim

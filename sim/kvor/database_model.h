@@ -7,6 +7,8 @@
 
 #include <cstdint>
 #include <list>
+#include <map>
+#include <optional>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -25,6 +27,33 @@ enum class FrameFormat : uint32_t { kCan = 0, kCanFd = 1 };
 // The part a signal plays in a multiplexed frame: the multiplexer selects which of the
 // multiplexed signals the payload carries; plain signals are always there.
 enum class MuxRole { kPlain, kMultiplexer, kMultiplexed };
+
+// A value of an attribute of a database file, as the file writes it: a number's text, or a
+// string's text without its quotes.
+struct tAttributeValue {
+  std::string text;
+  bool quoted = false;
+};
+using tAttributeValues = std::map<std::string, tAttributeValue>;
+
+// Kinds of object that a database file defines attributes for, as the file names them ("" is the
+// database itself).
+constexpr std::string_view kAttrOfDatabase = "";
+constexpr std::string_view kAttrOfEcu = "BU_";
+constexpr std::string_view kAttrOfFrame = "BO_";
+constexpr std::string_view kAttrOfSignal = "SG_";
+
+// An attribute definition with its default. `type` is INT, HEX, FLOAT, STRING or ENUM; the
+// range is kept as written, the enumeration's texts in their order.
+struct tAttributeDefinition {
+  std::string objectKind;
+  std::string name;
+  std::string type;
+  std::string minimum;
+  std::string maximum;
+  std::vector<std::string> enumTexts;
+  std::optional<tAttributeValue> defaultValue;
+};
 
 struct tValueName {
   double value = 0;
@@ -50,6 +79,15 @@ struct tSignal {
   uint32_t muxValue = 0;  // the multiplexer's raw value that selects a multiplexed signal
   std::vector<std::string> receivers;
   std::vector<tValueName> valueNames;
+  tAttributeValues attributes;
+};
+
+// The payload of a multiplexed frame for one value of its multiplexer: the multiplexed signals of
+// that value, beside the frame's plain ones. A file writes the value alone, so a subframe read
+// from one is named "m" and the value, as its signals are marked.
+struct tSubframe {
+  std::string name;
+  uint32_t muxValue = 0;
 };
 
 struct tFrame {
@@ -65,11 +103,24 @@ struct tFrame {
   std::string transmitter;
   std::string comment;
   std::list<tSignal> signals;
+  std::list<tSubframe> subframes;
+  tAttributeValues attributes;
 };
 
 struct tEcu {
   std::string name;
   std::string comment;
+  tAttributeValues attributes;
+};
+
+// LIN schedules, which a CAN database file cannot hold: made by callers only.
+struct tLinScheduleEntry {
+  std::string name;
+};
+
+struct tLinSchedule {
+  std::string name;
+  std::list<tLinScheduleEntry> entries;
 };
 
 struct tValueTable {
@@ -86,6 +137,9 @@ struct tCluster {
   std::list<tEcu> ecus;
   std::list<tFrame> frames;
   std::vector<tValueTable> valueTables;
+  std::list<tLinSchedule> linSchedules;
+  std::vector<tAttributeDefinition> attributeDefinitions;
+  tAttributeValues attributes;  // the file's own, which the database has
 };
 
 struct tDatabase {
@@ -109,6 +163,12 @@ uint32_t MaxFrameId(bool extended);
 const tSignal *FindSignal(const tFrame &frame, std::string_view name);
 // The frame's multiplexer, or null for a frame without one.
 const tSignal *FindMultiplexer(const tFrame &frame);
+
+// The name that a subframe read from a file has: "m" and the multiplexer's value.
+std::string SubframeName(uint32_t muxValue);
+// Gives a multiplexed frame a subframe for each value that its multiplexed signals are selected
+// by and that has none yet.
+void AddMissingSubframes(tFrame *frame);
 
 }  // namespace nKvorSim
 

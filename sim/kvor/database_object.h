@@ -14,16 +14,22 @@ constexpr uint32_t kClassDatabase = 0x00000;
 constexpr uint32_t kClassCluster = 0x10000;
 constexpr uint32_t kClassFrame = 0x20000;
 constexpr uint32_t kClassSignal = 0x30000;
+constexpr uint32_t kClassSubframe = 0x40000;
 constexpr uint32_t kClassEcu = 0x50000;
+constexpr uint32_t kClassLinSchedule = 0x60000;
+constexpr uint32_t kClassLinScheduleEntry = 0x70000;
 constexpr uint32_t kClassPdu = 0x80000;  // the PDU of a frame: the frame's own payload
 
 struct tObjectRef {
   uint32_t objectClass = kClassDatabase;
   tDatabase *database = nullptr;
   tCluster *cluster = nullptr;
-  tFrame *frame = nullptr;  // for a frame, its PDU and its signals
+  tFrame *frame = nullptr;  // for a frame, its PDU, its subframes and its signals
   tSignal *signal = nullptr;
+  tSubframe *subframe = nullptr;
   tEcu *ecu = nullptr;
+  tLinSchedule *schedule = nullptr;  // for a schedule and its entries
+  tLinScheduleEntry *entry = nullptr;
 };
 
 // The object itself, which tells it apart from every other object of its class.
@@ -36,8 +42,14 @@ inline const void *ObjectOf(const tObjectRef &ref) {
       return ref.frame;
     case kClassSignal:
       return ref.signal;
+    case kClassSubframe:
+      return ref.subframe;
     case kClassEcu:
       return ref.ecu;
+    case kClassLinSchedule:
+      return ref.schedule;
+    case kClassLinScheduleEntry:
+      return ref.entry;
     default:
       return ref.database;
   }

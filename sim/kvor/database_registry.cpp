@@ -2,7 +2,9 @@
 
 #include <cstring>
 
+#include "database_dbc_attributes.h"
 #include "database_files.h"
+#include "database_merge.h"
 #include "database_properties.h"
 #include "kvsim.h"
 #include "kvsvapi.h"
@@ -176,6 +178,23 @@ Status DatabaseRegistry::Close(uint32_t handle, uint32_t closeAll) {
   return 0;
 }
 
+Status DatabaseRegistry::DatabaseOf(uint32_t handle, uint32_t *database) {
+  if (database == nullptr) return kvsimErrNullPointer;
+  std::lock_guard<std::mutex> lock(mutex_);
+  tEntry *entry = Resolve(handle);
+  if (entry == nullptr) return kvsimErrInvalidDatabase;
+  *database = entry->loaded->handle;
+  return 0;
+}
+
+Status DatabaseRegistry::OpenByRef(uint32_t handle) {
+  std::lock_guard<std::mutex> lock(mutex_);
+  tEntry *entry = Resolve(handle);
+  if (entry == nullptr) return kvsimErrInvalidDatabase;
+  ++entry->loaded->opens;
+  return 0;
+}
+
 Status DatabaseRegistry::Find(const tObjectRef &parent, uint32_t objectClass,
                               const std::string &name, tObjectRef *found) {
   switch (parent.objectClass) {
@@ -277,7 +296,8 @@ Status DatabaseRegistry::CreateObject(uint32_t parent, uint32_t objectClass, con
     made.cluster->baudRate = kDefaultBaudRate;
   } else if (at.objectClass == kClassCluster && objectClass == kClassEcu) {
     if (FindNamed(at.cluster->ecus, text) != nullptr) return kvsimErrObjectExists;
-    made.ecu = &at.cluster->ecus.emplace_back(tEcu{text, {}});
+    made.ecu = &at.cluster->ecus.emplace_back();
+    made.ecu->name = text;
   } else if (at.objectClass == kClassCluster && objectClass == kClassFrame) {
     if (FindNamed(at.cluster->frames, text) != nullptr) return kvsimErrObjectExists;
     // The lowest identifier that is free, standard before extended.
@@ -399,6 +419,78 @@ Status DatabaseRegistry::Save(uint32_t handle, const char *path) {
   return status != 0 ? Fail(status, error) : 0;
 }
 
+Status DatabaseRegistry::Merge(uint32_t target, uint32_t source, uint32_t copyMode,
+                               const char *prefix) {
+  std::lock_guard<std::mutex> lock(mutex_);
+  tEntry *into = Resolve(target);
+  tEntry *from = Resolve(source);
+  if (into == nullptr || from == nullptr) return kvsimErrInvalidDatabase;
+  if (into->ref.objectClass != kClassCluster || from->ref.objectClass != kClassCluster) {
+    return kvsimErrInvalidClass;
+  }
+  if (into->loaded == from->loaded) return kvsimErrInvalidArgument;
+  std::string error;
+  const Status status = MergeCluster(
+      into->ref.cluster, *from->ref.cluster, static_cast<MergeMode>(copyMode),
+      prefix != nullptr ? prefix : "",
+      [&](const void *replaced) {
+        DropHandles([&](const tEntry &e) { return e.ref.frame == replaced || e.ref.ecu == replaced; });
+      },
+      &error);
+  return status != 0 && !error.empty() ? Fail(status, "merge: " + error) : status;
+}
+
+Status DatabaseRegistry::GetDbcAttributeSize(uint32_t object, uint32_t mode, const char *name,
+                                             uint32_t *size) {
+  if (size == nullptr) return kvsimErrNullPointer;
+  std::lock_guard<std::mutex> lock(mutex_);
+  tEntry *entry = Resolve(object);
+  if (entry == nullptr) return kvsimErrInvalidDatabase;
+  std::string text;
+  bool isDefault = false;
+  const Status status = DbcAttributeText(entry->ref, mode, name, &text, &isDefault);
+  if (status == 0) *size = static_cast<uint32_t>(text.size() + 1);
+  return status;
+}
+
+Status DatabaseRegistry::GetDbcAttribute(uint32_t object, uint32_t mode, const char *name,
+                                         uint32_t size, char *value, uint32_t *isDefault) {
+  if (value == nullptr) return kvsimErrNullPointer;
+  std::lock_guard<std::mutex> lock(mutex_);
+  tEntry *entry = Resolve(object);
+  if (entry == nullptr) return kvsimErrInvalidDatabase;
+  std::string text;
+  bool byDefault = false;
+  const Status status = DbcAttributeText(entry->ref, mode, name, &text, &byDefault);
+  if (status != 0) return status;
+  if (text.size() >= size) return kvsimErrBufferTooSmall;
+  std::memcpy(value, text.c_str(), text.size() + 1);
+  if (isDefault != nullptr && mode == 0) *isDefault = byDefault ? 1 : 0;
+  return 0;
+}
+
+Status DatabaseRegistry::Deploy(const char *ipAddress, const char *alias) {
+  if (ipAddress == nullptr || alias == nullptr) return kvsimErrNullPointer;
+  std::lock_guard<std::mutex> lock(mutex_);
+  if (*ipAddress == '\0') return kvsimErrInvalidArgument;
+  const std::optional<tAlias> known = aliases_.Find(alias);
+  if (!known) return Fail(kvsimErrDatabaseNotFound, std::string(alias) + ": no such alias to deploy");
+  deployed_[ipAddress].Add(alias, *known);
+  return 0;
+}
+
+Status DatabaseRegistry::Undeploy(const char *ipAddress, const char *alias) {
+  if (ipAddress == nullptr || alias == nullptr) return kvsimErrNullPointer;
+  std::lock_guard<std::mutex> lock(mutex_);
+  const auto target = deployed_.find(ipAddress);
+  if (target == deployed_.end() || !target->second.Remove(alias)) {
+    return Fail(kvsimErrDatabaseNotFound,
+                std::string(alias) + ": not deployed at " + ipAddress);
+  }
+  if (target->second.Count() == 0) deployed_.erase(target);
+  return 0;
+}
+
 Status DatabaseRegistry::AddAlias(const char *alias, const char *path, uint64_t baudRate) {
   if (alias == nullptr || path == nullptr) return kvsimErrNullPointer;
   std::lock_guard<std::mutex> lock(mutex_);
@@ -421,12 +513,18 @@ Status DatabaseRegistry::RemoveAlias(const char *alias) {
   return aliases_.Remove(alias) ? 0 : kvsimErrDatabaseNotFound;
 }
 
+const DatabaseAliases *DatabaseRegistry::ListOf(uint64_t target) {
+  if (target == 0) return &aliases_;
+  static const DatabaseAliases kNothing;
+  const auto found = deployed_.find(reinterpret_cast<const char *>(static_cast<uintptr_t>(target)));
+  return found == deployed_.end() ? &kNothing : &found->second;
+}
+
 Status DatabaseRegistry::GetListSizes(uint64_t target, uint32_t *aliasesSize, uint32_t *pathsSize) {
   if (aliasesSize == nullptr || pathsSize == nullptr) return kvsimErrNullPointer;
-  if (target != 0) return kvsimErrInvalidArgument;  // only this machine
   std::lock_guard<std::mutex> lock(mutex_);
   std::string aliases, paths;
-  aliases_.Lists(&aliases, &paths);
+  ListOf(target)->Lists(&aliases, &paths);
   *aliasesSize = static_cast<uint32_t>(aliases.size() + 1);
   *pathsSize = static_cast<uint32_t>(paths.size() + 1);
   return 0;
@@ -435,16 +533,16 @@ Status DatabaseRegistry::GetListSizes(uint64_t target, uint32_t *aliasesSize, ui
 Status DatabaseRegistry::GetList(uint64_t target, uint32_t aliasesSize, char *aliases,
                                  uint32_t pathsSize, char *paths, uint32_t *count) {
   if (aliases == nullptr || paths == nullptr || count == nullptr) return kvsimErrNullPointer;
-  if (target != 0) return kvsimErrInvalidArgument;
   std::lock_guard<std::mutex> lock(mutex_);
+  const DatabaseAliases *list = ListOf(target);
   std::string aliasList, pathList;
-  aliases_.Lists(&aliasList, &pathList);
+  list->Lists(&aliasList, &pathList);
   if (aliasList.size() >= aliasesSize || pathList.size() >= pathsSize) {
     return kvErrDatabaseListChanged;
   }
   std::memcpy(aliases, aliasList.c_str(), aliasList.size() + 1);
   std::memcpy(paths, pathList.c_str(), pathList.size() + 1);
-  *count = static_cast<uint32_t>(aliases_.Count());
+  *count = static_cast<uint32_t>(list->Count());
   return 0;
 }
 
@@ -524,6 +622,7 @@ void DatabaseRegistry::Reset() {
   errorObjects_.clear();
   loaded_.clear();
   aliases_.Clear();
+  deployed_.clear();
   errorText_.clear();
 }
 

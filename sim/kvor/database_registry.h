@@ -40,6 +40,11 @@ class DatabaseRegistry {
   // handles go.
   Status Close(uint32_t handle, uint32_t closeAll);
 
+  // The database of `handle`, its own or an object's.
+  Status DatabaseOf(uint32_t handle, uint32_t *database);
+  // One more open of the database of `handle`, which a close of any of its handles gives back.
+  Status OpenByRef(uint32_t handle);
+
   Status FindObject(uint32_t parent, uint32_t objectClass, const char *name, uint32_t *object);
   Status CreateObject(uint32_t parent, uint32_t objectClass, const char *name, uint32_t *object);
   Status DeleteObject(uint32_t object);
@@ -52,10 +57,24 @@ class DatabaseRegistry {
   // or empty. The database stays bound to its own file.
   Status Save(uint32_t handle, const char *path);
 
+  // Copies the cluster `source` into the cluster `target` of another database (see MergeCluster).
+  Status Merge(uint32_t target, uint32_t source, uint32_t copyMode, const char *prefix);
+
+  // The attribute calls (see DbcAttributeText); sizes count the NUL.
+  Status GetDbcAttributeSize(uint32_t object, uint32_t mode, const char *name, uint32_t *size);
+  Status GetDbcAttribute(uint32_t object, uint32_t mode, const char *name, uint32_t size,
+                         char *value, uint32_t *isDefault);
+
+  // The file of `alias` made known at the target of that IP address under the same alias, or
+  // taken away there.
+  Status Deploy(const char *ipAddress, const char *alias);
+  Status Undeploy(const char *ipAddress, const char *alias);
+
   Status AddAlias(const char *alias, const char *path, uint64_t baudRate);
   Status RemoveAlias(const char *alias);
   // The aliases and their files as comma-separated lists; sizes count the NUL. A list that no
-  // longer fits the sizes given is kvErrDatabaseListChanged.
+  // longer fits the sizes given is kvErrDatabaseListChanged. `target` 0 is this machine, any
+  // other the address of the IP address text of a target, which lists what was deployed there.
   Status GetListSizes(uint64_t target, uint32_t *aliasesSize, uint32_t *pathsSize);
   Status GetList(uint64_t target, uint32_t aliasesSize, char *aliases, uint32_t pathsSize,
                  char *paths, uint32_t *count);
@@ -103,6 +122,8 @@ class DatabaseRegistry {
   Status Find(const tObjectRef &parent, uint32_t objectClass, const std::string &name,
               tObjectRef *found);
   Status Fail(Status status, std::string text);
+  // The alias list of `target` (0: this machine), or null for a null address text.
+  const DatabaseAliases *ListOf(uint64_t target);
 
   mutable std::mutex mutex_;
   std::map<std::string, std::unique_ptr<tLoaded>> loaded_;  // by key
@@ -112,6 +133,7 @@ class DatabaseRegistry {
   std::unordered_map<uint32_t, Status> errorObjects_;
   uint32_t lastErrorNumber_ = 0;
   DatabaseAliases aliases_;
+  std::map<std::string, DatabaseAliases> deployed_;  // by IP address
   std::string errorText_;
 };
 

@@ -205,7 +205,7 @@ void cDbcParser::ReadNodes(uint32_t line) {
     }
     const tDbcToken name = lexer_.Next();
     // A node listed twice is still one node.
-    if (EcuOf(name) == nullptr) cluster_->ecus.push_back(tEcu{name.text, {}});
+    if (EcuOf(name) == nullptr) cluster_->ecus.emplace_back().name = name.text;
   }
 }
 

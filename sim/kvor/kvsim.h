@@ -669,8 +669,10 @@ enum kvsimDatabaseStatus {
  * The call log records the kvdb functions with: `object` the handle made (kvdbOpenDatabase, 0 if
  * it failed) or the object or parent given; `propertyId` the identifier of the property calls;
  * `size1` the class (kvdbFindObject, kvdbCreateObject), closeAll, the property size, the baud
- * rate (kvdbAddAlias) or the aliases size (kvdbGetDatabaseList, with the paths size in `size2`);
- * `text` the name, alias or path given. */
+ * rate (kvdbAddAlias), the aliases size (kvdbGetDatabaseList, with the paths size in `size2`),
+ * the copy mode (kvdbMerge, with the source cluster in `size2`) or the mode (kvdbGetDBCAttribute
+ * and its size call, with the buffer size in `size2`); `text` the name, alias, path or prefix
+ * given. */
 KVSIM_API int32_t kvsimDatabaseErrorText(char *text, uint32_t size);
 
 /* Number of databases loaded: opened and not yet closed as often. */
