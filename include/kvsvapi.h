@@ -784,6 +784,91 @@ KVSV_EXPORT kvsvStatus kvsvdbGetDatabaseList(uint64_t target, SvHandle *aliases,
 KVSV_EXPORT kvsvStatus kvsvdbGetDBCAttribute(uint32_t object, uint32_t mode, const char *name,
                                              SvHandle *value, uint32_t *isDefault);
 
+/* ---- Databases -----------------------------------------------------------------------------
+ * A database object is named by a reference text: a database by its name or alias; a cluster by
+ * "database.cluster", or the database alone for its cluster of empty name; any other object by
+ * its name, one or more blanks or line feeds, then "database.cluster", or the database alone when
+ * the cluster is named "Cluster". Frame, ECU, LIN schedule and PDU names hold no dot; signal,
+ * subframe and LIN schedule entry names ("frame.signal") at most one. Classes: 0 database,
+ * 0x10000 cluster, 0x20000 frame, 0x30000 signal, 0x40000 subframe, 0x50000 ECU, 0x60000 LIN
+ * schedule, 0x70000 LIN schedule entry, 0x80000 PDU. The statuses of a malformed text:
+ * 0xBFF63163 empty or null, 0xBFF63164 no database part, 0xBFF63173 too many dots in the name.
+ * One database is opened either by a program (the Manual functions) or by the host's references
+ * (the Open and Close functions below), never both: 0xBFF6315E, and the object is not kept. */
+
+/* A program's open of the object of class `objectClass` named by the host string `name`. The
+ * reference registered with the host goes to *reference; the program ends it with
+ * kvsvdbManualClose, or the host ends it when the program stops. A text opened already gives the
+ * same object and no further holder. A failed open is registered all the same, as an object that
+ * gives the failure at its first use, and its status returned. 0xBFF63001: the host refused the
+ * registration (the object is closed again); 0xBFF63010: out of memory. */
+KVSV_EXPORT kvsvStatus kvsvdbManualOpen(uint32_t objectClass, SvHandle name,
+                                        kvsvRefnum *reference);
+
+/* A program's close of `handle`, opened as the host string `name` under `reference`.
+ * `closeAll` 0: one holder of the text; the driver's close and the end of the reference come with
+ * the last. Otherwise the whole database of `handle`: every reference of its texts ends and the
+ * driver closes all of it. *reserved1 and *reserved2 (either may be null) are set to 0. The first
+ * failure of the driver's close, the host's removal of the reference, the account's release
+ * (0xBFF63131: a handle no open gave), in that order; else the driver's status. Do not use the
+ * handle afterwards. */
+KVSV_EXPORT kvsvStatus kvsvdbManualClose(uint32_t handle, SvHandle name, kvsvRefnum reference,
+                                         int32_t closeAll, uint64_t *reserved1,
+                                         uint64_t *reserved2);
+
+/* Ends the references of every object of the database of `handle` but the database's own, and
+ * forgets them; the driver closes nothing. 0xBFF63131 for a handle no open gave, else the first
+ * failure of the host's removals. */
+KVSV_EXPORT kvsvStatus kvsvhdndbManualCloseChildren(uint32_t handle);
+
+/* Ends the host's reference `reference` and nothing else: no close reaches the driver. 0 for
+ * reference 0; 0xBFF63001 if the host refuses. */
+KVSV_EXPORT kvsvStatus kvsvdbUnregisterWithSV(kvsvRefnum reference);
+
+/* Number of databases that hold objects opened through this library. Not a status. */
+KVSV_EXPORT uint32_t kvsvGetNumOpenDatabases(void);
+
+/* The host's open of the object of class `objectClass` named by the host string *name:
+ * *handleOut gets the object, or, when the open fails, an object that gives the failure at its
+ * first use; the failure is also returned. A text opened already gives the same object, and the
+ * first close ends it for all. `context` is not used. */
+KVSV_EXPORT kvsvStatus kvsvdbAutoOpenDbObject(SvHandle *name, uint32_t objectClass,
+                                              uint32_t *handleOut, uint64_t context);
+
+/* The host's close of `handle`: one holder given back, and the driver's close with the last (or
+ * for a handle no open gave). The driver's status, or 0 while holders remain. */
+KVSV_EXPORT kvsvStatus kvsvdbAutoCloseDbObject(uint32_t handle);
+
+/* The exports that the host calls by name to open (by the host string *name) and close a
+ * reference of each class; they always return 0: a failed open gives an object that fails at its
+ * first use. A close given a handle of another class closes it as that class. */
+#define KVSV_DB_REFERENCE_EXPORTS(openExport, closeExport)                                      \
+  KVSV_EXPORT kvsvStatus openExport(SvHandle *name, uint32_t *handleOut, uint64_t context);    \
+  KVSV_EXPORT kvsvStatus closeExport(uint32_t handle);
+KVSV_DB_REFERENCE_EXPORTS(kvsvdbDatabaseOpen, kvsvdbDatabaseClose)
+KVSV_DB_REFERENCE_EXPORTS(kvsvdbClusterOpen, kvsvdbClusterClose)
+KVSV_DB_REFERENCE_EXPORTS(kvsvdbFrameOpen, kvsvdbFrameClose)
+KVSV_DB_REFERENCE_EXPORTS(kvsvdbSignalOpen, kvsvdbSignalClose)
+KVSV_DB_REFERENCE_EXPORTS(kvsvdbSubframeOpen, kvsvdbSubframeClose)
+KVSV_DB_REFERENCE_EXPORTS(kvsvdbEcuOpen, kvsvdbEcuClose)
+KVSV_DB_REFERENCE_EXPORTS(kvsvdbLINSchedOpen, kvsvdbLINSchedClose)
+KVSV_DB_REFERENCE_EXPORTS(kvsvdbLINSchedEntryOpen, kvsvdbLINSchedEntryClose)
+KVSV_DB_REFERENCE_EXPORTS(kvsvdbPDUOpen, kvsvdbPDUClose)
+#undef KVSV_DB_REFERENCE_EXPORTS
+
+/* Creates an object of `objectClass` named `name` under `parent` and registers it with the host
+ * under its reference text, into *reference. The host always gets a reference: when the create
+ * fails, it is named "___kvorInvalid__" and `name`, stands for no object, and the failure is
+ * returned. 0xBFF63001: the host refused the registration (a created object is deleted again). */
+KVSV_EXPORT kvsvStatus kvsvdbCreateObject(uint32_t parent, uint32_t objectClass, const char *name,
+                                          kvsvRefnum *reference);
+
+/* Deletes the object `handle` with all its holders and ends the host's `reference`. The first
+ * failure of the driver's delete, the host's removal, the driver's close, in that order; else the
+ * delete's status. An object with more than 100 holders is logged as an internal error and
+ * deleted all the same. */
+KVSV_EXPORT kvsvStatus kvsvdbDeleteObject(uint32_t handle, kvsvRefnum reference);
+
 #ifdef __cplusplus
 }
 #endif

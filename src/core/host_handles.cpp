@@ -11,8 +11,6 @@ namespace {
 
 // Room left behind the appended elements, so that a growing list is not resized on every call.
 constexpr uint32_t kGrowMargin = 20;
-// The name attribute of a variant, length-prefixed as the host wants it.
-constexpr unsigned char kNameAttribute[] = {1, 'n'};
 constexpr uint32_t kCommaListModeLine = 782;
 
 // A string handle holding `length` bytes of `text`, or null.
@@ -130,7 +128,7 @@ Status CommaListToStringArray(char *text, SvHandle *array, int32_t mode) {
     if (mode == 0) {
       ArrayData8<SvHandle>(*array)[first + i] = string;
     } else if (string != nullptr) {
-      svVariantSetStringAttr(ArrayData8<uint64_t>(*array) + first + i, kNameAttribute, string);
+      svVariantSetStringAttr(ArrayData8<uint64_t>(*array) + first + i, kVariantNameAttribute, string);
       DisposeHandle(&string);
     }
   }

@@ -43,6 +43,9 @@ void DisposeHandleArray(SvHandle *array);
 // Copies a counted string. Null `source` gives 0xBFF63015; out of memory 0xBFF63010.
 Status StringFromSvStr(std::string &target, const SvStr *source);
 
+// The name attribute of a variant element, length-prefixed as the host wants it.
+inline constexpr unsigned char kVariantNameAttribute[] = {1, 'n'};
+
 // Splits a comma-separated text (changed in place) into string handles. Mode 0: a new array of
 // strings. Mode 2: appended to an array of variants as their "n" attribute.
 Status CommaListToStringArray(char *text, SvHandle *array, int32_t mode);

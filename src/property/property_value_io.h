@@ -29,6 +29,19 @@ struct tSessionPropertyCalls {
   }
 };
 
+// The driver's property calls on database objects.
+struct tDbPropertyCalls {
+  static Status GetSize(uint32_t object, uint32_t id, uint32_t *size) {
+    return kvdbGetPropertySize(object, id, size);
+  }
+  static Status Get(uint32_t object, uint32_t id, uint32_t size, void *buffer) {
+    return kvdbGetProperty(object, id, size, buffer);
+  }
+  static Status Set(uint32_t object, uint32_t id, uint32_t size, const void *buffer) {
+    return kvdbSetProperty(object, id, size, buffer);
+  }
+};
+
 // Host arrays and strings carry a 32-bit count in front of their data.
 constexpr uint32_t kHostCountBytes = 4;
 

@@ -179,6 +179,18 @@ void CloseDispatch(uint32_t handle, uint32_t objectClass) {
       if (report) Report(2254, objectClass);
       kvsvInterfaceClose(handle);
       break;
+    case kClassDatabase:
+    case kClassCluster:
+    case kClassFrame:
+    case kClassSignal:
+    case kClassSubframe:
+    case kClassEcu:
+    case kClassLinSchedule:
+    case kClassLinScheduleEntry:
+    case kClassPdu:
+      if (report) Report(2232, objectClass);
+      kvsvdbAutoCloseDbObject(handle);
+      break;
     case kClassBareDatabase:
       kvdbCloseDatabase(handle, 0);
       break;
