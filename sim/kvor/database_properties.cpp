@@ -15,6 +15,11 @@ namespace nKvorSim {
 
 namespace {
 
+// The cluster references of a signal, a subframe and a LIN schedule entry, which have no names.
+constexpr uint32_t kSignalClusterRef = 0x05030034u;
+constexpr uint32_t kSubframeClusterRef = 0x05040006u;
+constexpr uint32_t kEntryClusterRef = 0x05070009u;
+
 // A PDU of a classic frame starts with the frame and has no update bit.
 constexpr uint32_t kPduStartBit = 0;
 constexpr uint32_t kNoUpdateBit = 0xFFFFFFFFu;
@@ -66,6 +71,17 @@ PropertyValue SignalHandles(const tObjectRef &frameRef, iObjectHandles &handles,
 }
 
 bool IsMultiplexed(const tFrame &frame) { return FindMultiplexer(frame) != nullptr; }
+
+PropertyValue SubframeHandles(const tObjectRef &frameRef, iObjectHandles &handles) {
+  AddMissingSubframes(frameRef.frame);
+  std::vector<uint32_t> list;
+  for (tSubframe &subframe : frameRef.frame->subframes) {
+    tObjectRef ref = FrameRef(frameRef, frameRef.frame, kClassSubframe);
+    ref.subframe = &subframe;
+    list.push_back(handles.HandleOf(ref));
+  }
+  return HandleArrayValue(list);
+}
 
 Status FrameConfigStatus(const tFrame &frame) {
   bool multiplexed = false;
@@ -141,6 +157,9 @@ std::optional<PropertyValue> FrameOrPduProperty(const tObjectRef &object, uint32
     case kvPropPDU_MuxStaticSigRefs:
       return SignalHandles(object, handles,
                            [](const tSignal &s) { return s.mux != MuxRole::kMultiplexed; });
+    case kvPropFrm_MuxSubframeRefs:
+    case kvPropPDU_MuxSubframeRefs:
+      return SubframeHandles(object, handles);
     default:
       break;
   }
@@ -211,6 +230,84 @@ std::optional<PropertyValue> SignalProperty(const tObjectRef &object, uint32_t i
       return BoolValue(signal.mux == MuxRole::kMultiplexed);
     case kvPropSig_MuxValue:
       return Plain(signal.muxValue);
+    case kSignalClusterRef:
+      return Plain(handles.HandleOf(ClusterRef(object)));
+    case kvPropSig_MuxSubfrmRef: {
+      if (signal.mux != MuxRole::kMultiplexed) return std::nullopt;
+      AddMissingSubframes(object.frame);
+      for (tSubframe &subframe : object.frame->subframes) {
+        if (subframe.muxValue != signal.muxValue) continue;
+        tObjectRef ref = FrameRef(object, object.frame, kClassSubframe);
+        ref.subframe = &subframe;
+        return Plain(handles.HandleOf(ref));
+      }
+      return std::nullopt;
+    }
+    default:
+      return std::nullopt;
+  }
+}
+
+std::optional<PropertyValue> SubframeProperty(const tObjectRef &object, uint32_t id,
+                                              iObjectHandles &handles) {
+  const tSubframe &subframe = *object.subframe;
+  switch (id) {
+    case kvPropSubfrm_Name:
+      return TextValue(subframe.name);
+    case kvPropSubfrm_NameUniqueToCluster:
+      return TextValue(object.frame->name + "." + subframe.name);
+    case kSubframeClusterRef:
+      return Plain(handles.HandleOf(ClusterRef(object)));
+    case kvPropSubfrm_FrmRef:
+      return Plain(handles.HandleOf(FrameRef(object, object.frame)));
+    case kvPropSubfrm_PDURef:
+      return Plain(handles.HandleOf(FrameRef(object, object.frame, kClassPdu)));
+    case kvPropSubfrm_MuxValue:
+      return Plain(subframe.muxValue);
+    case kvPropSubfrm_DynSigRefs:
+      return SignalHandles(object, handles, [&](const tSignal &s) {
+        return s.mux == MuxRole::kMultiplexed && s.muxValue == subframe.muxValue;
+      });
+    default:
+      return std::nullopt;
+  }
+}
+
+std::optional<PropertyValue> ScheduleProperty(const tObjectRef &object, uint32_t id,
+                                              iObjectHandles &handles) {
+  if (object.objectClass == kClassLinScheduleEntry) {
+    switch (id) {
+      case kvPropLINSchedEntry_Name:
+        return TextValue(object.entry->name);
+      case kvPropLINSchedEntry_NameUniqueToCluster:
+        return TextValue(object.schedule->name + "." + object.entry->name);
+      case kEntryClusterRef:
+        return Plain(handles.HandleOf(ClusterRef(object)));
+      case kvPropLINSchedEntry_Sched: {
+        tObjectRef schedule = ClusterRef(object);
+        schedule.objectClass = kClassLinSchedule;
+        schedule.schedule = object.schedule;
+        return Plain(handles.HandleOf(schedule));
+      }
+      default:
+        return std::nullopt;
+    }
+  }
+  switch (id) {
+    case kvPropLINSched_Name:
+      return TextValue(object.schedule->name);
+    case kvPropLINSched_ClstRef:
+      return Plain(handles.HandleOf(ClusterRef(object)));
+    case kvPropLINSched_Entries: {
+      std::vector<uint32_t> list;
+      for (tLinScheduleEntry &entry : object.schedule->entries) {
+        tObjectRef ref = object;
+        ref.objectClass = kClassLinScheduleEntry;
+        ref.entry = &entry;
+        list.push_back(handles.HandleOf(ref));
+      }
+      return HandleArrayValue(list);
+    }
     default:
       return std::nullopt;
   }
@@ -304,6 +401,14 @@ std::optional<PropertyValue> ClusterProperty(const tObjectRef &object, uint32_t 
         for (tSignal &signal : frame.signals) {
           list.push_back(handles.HandleOf(SignalRef(object, &frame, &signal)));
         }
+      }
+      return HandleArrayValue(list);
+    case kvPropClst_LINSchedules:
+      for (tLinSchedule &schedule : cluster.linSchedules) {
+        tObjectRef ref = ClusterRef(object);
+        ref.objectClass = kClassLinSchedule;
+        ref.schedule = &schedule;
+        list.push_back(handles.HandleOf(ref));
       }
       return HandleArrayValue(list);
     case kvPropClst_ECURefs:
@@ -552,6 +657,13 @@ Status GetDatabaseProperty(const tObjectRef &object, uint32_t id, iObjectHandles
       break;
     case kClassEcu:
       found = EcuProperty(object, id, handles);
+      break;
+    case kClassSubframe:
+      found = SubframeProperty(object, id, handles);
+      break;
+    case kClassLinSchedule:
+    case kClassLinScheduleEntry:
+      found = ScheduleProperty(object, id, handles);
       break;
     default:
       break;

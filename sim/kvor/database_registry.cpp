@@ -1,10 +1,12 @@
 #include "database_registry.h"
 
 #include <cstring>
+#include <set>
 
 #include "database_dbc_attributes.h"
 #include "database_files.h"
 #include "database_merge.h"
+#include "database_tree.h"
 #include "database_properties.h"
 #include "kvsim.h"
 #include "kvsvapi.h"
@@ -18,38 +20,6 @@ constexpr uint32_t kHandleTag = 0x80000000u;
 constexpr uint32_t kNumberMask = 0x00FFFFFFu;
 // Class number F, which no object of a database has.
 constexpr uint32_t kErrorObjectTag = 0x8F000000u;
-
-tObjectRef WithClass(const tObjectRef &from, uint32_t objectClass) {
-  tObjectRef ref = from;
-  ref.objectClass = objectClass;
-  return ref;
-}
-
-template <class List>
-auto *FindNamed(List &list, const std::string &name) {
-  for (auto &item : list) {
-    if (item.name == name) return &item;
-  }
-  return static_cast<typename List::value_type *>(nullptr);
-}
-
-template <class List, class Item>
-void EraseItem(List &list, const Item *item) {
-  for (auto it = list.begin(); it != list.end(); ++it) {
-    if (&*it == item) {
-      list.erase(it);
-      return;
-    }
-  }
-}
-
-tObjectRef ClusterRefOf(const tObjectRef &database, tCluster *cluster) {
-  tObjectRef ref;
-  ref.objectClass = kClassCluster;
-  ref.database = database.database;
-  ref.cluster = cluster;
-  return ref;
-}
 
 }  // namespace
 
@@ -195,76 +165,6 @@ Status DatabaseRegistry::OpenByRef(uint32_t handle) {
   return 0;
 }
 
-Status DatabaseRegistry::Find(const tObjectRef &parent, uint32_t objectClass,
-                              const std::string &name, tObjectRef *found) {
-  switch (parent.objectClass) {
-    case kClassDatabase: {
-      std::list<tCluster> &clusters = parent.database->clusters;
-      if (objectClass != kClassCluster) {
-        // A database of one cluster stands for it.
-        if (clusters.size() != 1) return kvsimErrInvalidClass;
-        return Find(ClusterRefOf(parent, &clusters.front()), objectClass, name, found);
-      }
-      tCluster *cluster = name.empty() && !clusters.empty() ? &clusters.front()
-                                                            : FindNamed(clusters, name);
-      if (cluster == nullptr) return kvsimErrObjectNotFound;
-      *found = ClusterRefOf(parent, cluster);
-      return 0;
-    }
-    case kClassCluster: {
-      if (objectClass == kClassEcu) {
-        tEcu *ecu = FindNamed(parent.cluster->ecus, name);
-        if (ecu == nullptr) return kvsimErrObjectNotFound;
-        *found = WithClass(parent, kClassEcu);
-        found->ecu = ecu;
-        return 0;
-      }
-      if (objectClass == kClassFrame || objectClass == kClassPdu) {
-        tFrame *frame = FindNamed(parent.cluster->frames, name);
-        if (frame == nullptr) return kvsimErrObjectNotFound;
-        *found = WithClass(parent, objectClass);
-        found->frame = frame;
-        return 0;
-      }
-      if (objectClass != kClassSignal) return kvsimErrInvalidClass;
-      const size_t dot = name.find('.');
-      if (dot != std::string::npos) {
-        tFrame *frame = FindNamed(parent.cluster->frames, name.substr(0, dot));
-        if (frame == nullptr) return kvsimErrObjectNotFound;
-        tObjectRef frameRef = WithClass(parent, kClassFrame);
-        frameRef.frame = frame;
-        return Find(frameRef, kClassSignal, name.substr(dot + 1), found);
-      }
-      // A bare signal name must be unique in the cluster.
-      bool seen = false;
-      for (tFrame &frame : parent.cluster->frames) {
-        tSignal *signal = FindNamed(frame.signals, name);
-        if (signal == nullptr) continue;
-        if (seen) {
-          return Fail(kvsimErrObjectNotFound,
-                      "signal '" + name + "' is in more than one frame: name it with its frame");
-        }
-        seen = true;
-        *found = WithClass(parent, kClassSignal);
-        found->frame = &frame;
-        found->signal = signal;
-      }
-      return seen ? 0 : kvsimErrObjectNotFound;
-    }
-    case kClassFrame:
-    case kClassPdu: {
-      if (objectClass != kClassSignal) return kvsimErrInvalidClass;
-      tSignal *signal = FindNamed(parent.frame->signals, name);
-      if (signal == nullptr) return kvsimErrObjectNotFound;
-      *found = WithClass(parent, kClassSignal);
-      found->signal = signal;
-      return 0;
-    }
-    default:
-      return kvsimErrInvalidClass;
-  }
-}
-
 Status DatabaseRegistry::FindObject(uint32_t parent, uint32_t objectClass, const char *name,
                                     uint32_t *object) {
   if (name == nullptr || object == nullptr) return kvsimErrNullPointer;
@@ -272,8 +172,9 @@ Status DatabaseRegistry::FindObject(uint32_t parent, uint32_t objectClass, const
   tEntry *entry = Resolve(parent);
   if (entry == nullptr) return kvsimErrInvalidDatabase;
   tObjectRef found;
-  const Status status = Find(entry->ref, objectClass, name, &found);
-  if (status != 0) return status;
+  std::string error;
+  const Status status = FindChild(entry->ref, objectClass, name, &found, &error);
+  if (status != 0) return error.empty() ? status : Fail(status, error);
   *object = HandleOf(entry->loaded, found);
   return 0;
 }
@@ -284,48 +185,10 @@ Status DatabaseRegistry::CreateObject(uint32_t parent, uint32_t objectClass, con
   std::lock_guard<std::mutex> lock(mutex_);
   tEntry *entry = Resolve(parent);
   if (entry == nullptr) return kvsimErrInvalidDatabase;
-  const std::string text = name;
-  if (!IsIdentifier(text)) return kvsimErrInvalidName;
-  const tObjectRef &at = entry->ref;
-  tObjectRef made = WithClass(at, objectClass);
-  if (at.objectClass == kClassDatabase && objectClass == kClassCluster) {
-    // A database file holds one cluster.
-    if (!at.database->clusters.empty()) return kvsimErrObjectExists;
-    made.cluster = &at.database->clusters.emplace_back();
-    made.cluster->name = text;
-    made.cluster->baudRate = kDefaultBaudRate;
-  } else if (at.objectClass == kClassCluster && objectClass == kClassEcu) {
-    if (FindNamed(at.cluster->ecus, text) != nullptr) return kvsimErrObjectExists;
-    made.ecu = &at.cluster->ecus.emplace_back();
-    made.ecu->name = text;
-  } else if (at.objectClass == kClassCluster && objectClass == kClassFrame) {
-    if (FindNamed(at.cluster->frames, text) != nullptr) return kvsimErrObjectExists;
-    // The lowest identifier that is free, standard before extended.
-    tFrame frame;
-    frame.name = text;
-    for (bool free = false; !free;) {
-      free = true;
-      for (const tFrame &other : at.cluster->frames) {
-        if (other.id == frame.id && other.extended == frame.extended) free = false;
-      }
-      if (free) break;
-      if (frame.id == MaxFrameId(frame.extended)) {
-        if (frame.extended) return kvsimErrObjectExists;
-        frame.extended = true;
-        frame.id = 0;
-      } else {
-        ++frame.id;
-      }
-    }
-    made.frame = &at.cluster->frames.emplace_back(std::move(frame));
-  } else if (at.objectClass == kClassFrame && objectClass == kClassSignal) {
-    if (FindNamed(at.frame->signals, text) != nullptr) return kvsimErrObjectExists;
-    tSignal signal;
-    signal.name = text;
-    made.signal = &at.frame->signals.emplace_back(std::move(signal));
-  } else {
-    return kvsimErrInvalidClass;
-  }
+  tObjectRef made;
+  const Status status = CreateChild(entry->ref, objectClass, name, &made);
+  if (status != 0) return status;
+  if (made.objectClass == kClassCluster) made.cluster->baudRate = kDefaultBaudRate;
   *object = HandleOf(entry->loaded, made);
   return 0;
 }
@@ -334,39 +197,10 @@ Status DatabaseRegistry::DeleteObject(uint32_t object) {
   std::lock_guard<std::mutex> lock(mutex_);
   tEntry *entry = Resolve(object);
   if (entry == nullptr) return kvsimErrInvalidDatabase;
-  const tObjectRef ref = entry->ref;
-  switch (ref.objectClass) {
-    case kClassCluster:
-      DropHandles([&](const tEntry &e) { return e.ref.cluster == ref.cluster; });
-      EraseItem(ref.database->clusters, ref.cluster);
-      return 0;
-    case kClassFrame:
-      DropHandles([&](const tEntry &e) { return e.ref.frame == ref.frame; });
-      EraseItem(ref.cluster->frames, ref.frame);
-      return 0;
-    case kClassSignal:
-      DropHandles([&](const tEntry &e) { return e.ref.signal == ref.signal; });
-      EraseItem(ref.frame->signals, ref.signal);
-      return 0;
-    case kClassEcu: {
-      const std::string name = ref.ecu->name;
-      for (tFrame &frame : ref.cluster->frames) {
-        if (frame.transmitter == name) frame.transmitter.clear();
-        for (tSignal &signal : frame.signals) {
-          auto &receivers = signal.receivers;
-          for (auto it = receivers.begin(); it != receivers.end();) {
-            it = *it == name ? receivers.erase(it) : it + 1;
-          }
-        }
-      }
-      DropHandles([&](const tEntry &e) { return e.ref.ecu == ref.ecu; });
-      EraseItem(ref.cluster->ecus, ref.ecu);
-      return 0;
-    }
-    default:
-      // A database goes by closing it, a PDU with its frame.
-      return kvsimErrInvalidClass;
-  }
+  std::set<const void *> gone;
+  const Status status = nKvorSim::DeleteObject(entry->ref, &gone);
+  if (status == 0) DropHandles([&](const tEntry &e) { return IsWithin(e.ref, gone); });
+  return status;
 }
 
 Status DatabaseRegistry::GetPropertySize(uint32_t object, uint32_t id, uint32_t *size) {

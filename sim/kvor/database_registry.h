@@ -2,7 +2,7 @@
 // files. Every database function of the driver ends here. Safe for many threads.
 //
 // A handle of a database object is 0x8CIIIIII: C the object's class number (0 database,
-// 1 cluster, 2 frame, 3 signal, 5 ECU, 8 PDU), IIIIII a number from 1 that no other handle of
+// 1 cluster, 2 frame, 3 signal, 4 subframe, 5 ECU, 6 LIN schedule, 7 LIN schedule entry, 8 PDU), IIIIII a number from 1 that no other handle of
 // a loaded database has. An object keeps its handle while it lives; a database keeps its own while
 // it stays loaded.
 #ifndef KVOR_SIM_DATABASE_REGISTRY_H
@@ -119,8 +119,6 @@ class DatabaseRegistry {
                   tDatabase *model);
   // The file that `name` stands for, and the baud rate that its alias gives, if any.
   Status LocateFile(const std::string &name, std::string *canonical, uint64_t *aliasBaudRate);
-  Status Find(const tObjectRef &parent, uint32_t objectClass, const std::string &name,
-              tObjectRef *found);
   Status Fail(Status status, std::string text);
   // The alias list of `target` (0: this machine), or null for a null address text.
   const DatabaseAliases *ListOf(uint64_t target);
