@@ -25,6 +25,10 @@ class DatabaseAliases {
   // The aliases and their paths as two comma-separated lists in the same order.
   void Lists(std::string *aliases, std::string *paths) const;
   size_t Count() const { return aliases_.size(); }
+  template <class Visit>
+  void ForEach(Visit visit) const {
+    for (const auto &[alias, target] : aliases_) visit(alias, target);
+  }
   void Clear() { aliases_.clear(); }
 
  private:

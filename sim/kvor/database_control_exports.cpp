@@ -1,4 +1,5 @@
-// The kvsim controls of the databases: the text of the latest file failure, the loaded count.
+// The kvsim controls of the databases: the text of the latest file failure, the loaded count, a
+// list that changes under its reader.
 #include <cstdio>
 #include <string>
 
@@ -17,6 +18,10 @@ int32_t kvsimDatabaseErrorText(char *text, uint32_t size) {
 
 int32_t kvsimLoadedDatabaseCount(void) {
   return static_cast<int32_t>(Driver::Instance().Databases().LoadedCount());
+}
+
+void kvsimChangeDatabaseList(int32_t count) {
+  Driver::Instance().Databases().ChangeListOnRead(count);
 }
 
 }  // extern "C"

@@ -1,5 +1,6 @@
 #include "database_files.h"
 
+#include <cstdio>
 #include <cstdlib>
 #include <fstream>
 #include <iterator>
@@ -43,10 +44,16 @@ Status LoadDatabaseFile(const std::string &path, std::string_view shownName, tDa
     return kvsimErrDatabaseNotFound;
   }
   tDbcError failure;
-  if (!ReadDbc(text, database, &failure)) {
+  std::vector<tDbcError> warnings;
+  if (!ReadDbc(text, database, &failure, &warnings)) {
     *error = std::string(shownName) + ", line " + std::to_string(failure.line) + ": " +
              failure.message;
     return kvsimErrDatabaseSyntax;
+  }
+  error->clear();
+  for (const tDbcError &warning : warnings) {
+    *error += (error->empty() ? "" : "; ") + std::string(shownName) + ", line " +
+              std::to_string(warning.line) + ": warning: " + warning.message;
   }
   return 0;
 }
@@ -54,10 +61,13 @@ Status LoadDatabaseFile(const std::string &path, std::string_view shownName, tDa
 Status SaveDatabaseFile(const tDatabase &database, const std::string &path, std::string *error) {
   std::string text;
   if (!WriteDbc(database, &text, error)) return kvsimErrDatabaseWrite;
-  std::ofstream file(path, std::ios::binary | std::ios::trunc);
+  // Written beside the file and renamed over it, so that a failed save leaves the file as it was.
+  const std::string temporary = path + ".kvsim-saving";
+  std::ofstream file(temporary, std::ios::binary | std::ios::trunc);
   if (file) file.write(text.data(), static_cast<std::streamsize>(text.size()));
   if (file) file.close();
-  if (!file) {
+  if (!file || std::rename(temporary.c_str(), path.c_str()) != 0) {
+    std::remove(temporary.c_str());
     *error = path + ": the file cannot be written";
     return kvsimErrDatabaseWrite;
   }

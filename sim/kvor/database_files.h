@@ -24,11 +24,13 @@ std::string DatabasePath(std::string_view name);
 std::string CanonicalPath(const std::string &path);
 
 // Reads the database file at `path`. Fails with kvsimErrDatabaseNotFound or kvsimErrDatabaseSyntax
-// and a message in *error that names `shownName` and, for a syntax error, the line.
+// and a message in *error that names `shownName` and, for a syntax error, the line. A file read
+// leaves in *error the warnings about what it accepted from other tools, each with its line.
 Status LoadDatabaseFile(const std::string &path, std::string_view shownName, tDatabase *database,
                         std::string *error);
 
-// Writes `database` to `path`, replacing the file. Fails with kvsimErrDatabaseWrite and a message.
+// Writes `database` to `path`, replacing the file whole or not at all. Fails with
+// kvsimErrDatabaseWrite and a message.
 Status SaveDatabaseFile(const tDatabase &database, const std::string &path, std::string *error);
 
 }  // namespace nKvorSim

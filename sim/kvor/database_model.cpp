@@ -13,6 +13,16 @@ bool IsIdentifier(std::string_view name) {
   return true;
 }
 
+bool IsFileName(std::string_view name) {
+  bool letter = false;
+  for (const char c : name) {
+    const bool digit = c >= '0' && c <= '9';
+    if (!digit && !IsIdentifier(std::string_view(&c, 1))) return false;
+    letter = letter || !digit;
+  }
+  return letter;
+}
+
 bool IsValidPayloadLength(uint32_t length) {
   if (length <= 8) return true;
   switch (length) {

@@ -153,6 +153,10 @@ struct tDatabase {
 // digits and underscores.
 bool IsIdentifier(std::string_view name);
 
+// Names that a database file can carry: identifiers, and what files of other tools write
+// besides, a name that starts with a digit but is no number.
+bool IsFileName(std::string_view name);
+
 // Bytes that a payload may have; CAN frames have up to 8, CAN FD frames one of the longer steps.
 bool IsValidPayloadLength(uint32_t length);
 

@@ -3,6 +3,7 @@
 #include <cstring>
 #include <set>
 
+#include "database_alias_file.h"
 #include "database_dbc_attributes.h"
 #include "database_files.h"
 #include "database_merge.h"
@@ -82,7 +83,7 @@ Status DatabaseRegistry::LocateFile(const std::string &name, std::string *canoni
                                     uint64_t *aliasBaudRate) {
   *aliasBaudRate = 0;
   std::string path = DatabasePath(name);
-  if (const std::optional<tAlias> alias = aliases_.Find(name)) {
+  if (const std::optional<tAlias> alias = Aliases().Find(name)) {
     path = alias->path;
     *aliasBaudRate = alias->baudRate;
   }
@@ -98,6 +99,7 @@ Status DatabaseRegistry::LoadFile(const std::string &path, const std::string &na
   std::string error;
   const Status status = LoadDatabaseFile(path, name, model, &error);
   if (status != 0) return Fail(status, error);
+  if (!error.empty()) errorText_ = error;
   // A file that gives no baud rate takes its alias's, else the usual one.
   for (tCluster &cluster : model->clusters) {
     if (cluster.baudRate == 0) cluster.baudRate = aliasBaudRate != 0 ? aliasBaudRate : kDefaultBaudRate;
@@ -307,7 +309,7 @@ Status DatabaseRegistry::Deploy(const char *ipAddress, const char *alias) {
   if (ipAddress == nullptr || alias == nullptr) return kvsimErrNullPointer;
   std::lock_guard<std::mutex> lock(mutex_);
   if (*ipAddress == '\0') return kvsimErrInvalidArgument;
-  const std::optional<tAlias> known = aliases_.Find(alias);
+  const std::optional<tAlias> known = Aliases().Find(alias);
   if (!known) return Fail(kvsimErrDatabaseNotFound, std::string(alias) + ": no such alias to deploy");
   deployed_[ipAddress].Add(alias, *known);
   return 0;
@@ -330,25 +332,46 @@ Status DatabaseRegistry::AddAlias(const char *alias, const char *path, uint64_t 
   std::lock_guard<std::mutex> lock(mutex_);
   const std::string name = alias;
   // The list of aliases is comma-separated, and the in-memory name is taken.
-  if (name.empty() || name.find(',') != std::string::npos || name == kMemoryName) {
+  // The alias file cuts its lines at tabs and line ends.
+  if (name.empty() || name.find_first_of(",\t\n") != std::string::npos || name == kMemoryName) {
     return kvsimErrInvalidName;
   }
   const std::string canonical = CanonicalPath(DatabasePath(path));
   if (canonical.empty()) {
     return Fail(kvsimErrDatabaseNotFound, name + ": no file at " + DatabasePath(path));
   }
-  aliases_.Add(name, tAlias{canonical, baudRate});
-  return 0;
+  if (canonical.find_first_of("\t\n") != std::string::npos) return kvsimErrInvalidName;
+  Aliases().Add(name, tAlias{canonical, baudRate});
+  return SaveAliases();
 }
 
 Status DatabaseRegistry::RemoveAlias(const char *alias) {
   if (alias == nullptr) return kvsimErrNullPointer;
   std::lock_guard<std::mutex> lock(mutex_);
-  return aliases_.Remove(alias) ? 0 : kvsimErrDatabaseNotFound;
+  if (!Aliases().Remove(alias)) return kvsimErrDatabaseNotFound;
+  return SaveAliases();
+}
+
+DatabaseAliases &DatabaseRegistry::Aliases() {
+  if (!aliasesRead_) {
+    aliases_ = ReadAliasFile();
+    aliasesRead_ = true;
+  }
+  return aliases_;
+}
+
+Status DatabaseRegistry::SaveAliases() {
+  std::string error;
+  return WriteAliasFile(aliases_, &error) ? 0 : Fail(kvsimErrDatabaseWrite, error);
+}
+
+void DatabaseRegistry::ChangeListOnRead(int32_t count) {
+  std::lock_guard<std::mutex> lock(mutex_);
+  listChanges_ = count;
 }
 
 const DatabaseAliases *DatabaseRegistry::ListOf(uint64_t target) {
-  if (target == 0) return &aliases_;
+  if (target == 0) return &Aliases();
   static const DatabaseAliases kNothing;
   const auto found = deployed_.find(reinterpret_cast<const char *>(static_cast<uintptr_t>(target)));
   return found == deployed_.end() ? &kNothing : &found->second;
@@ -371,6 +394,10 @@ Status DatabaseRegistry::GetList(uint64_t target, uint32_t aliasesSize, char *al
   const DatabaseAliases *list = ListOf(target);
   std::string aliasList, pathList;
   list->Lists(&aliasList, &pathList);
+  if (listChanges_ > 0) {
+    --listChanges_;
+    return kvErrDatabaseListChanged;
+  }
   if (aliasList.size() >= aliasesSize || pathList.size() >= pathsSize) {
     return kvErrDatabaseListChanged;
   }
@@ -456,6 +483,8 @@ void DatabaseRegistry::Reset() {
   errorObjects_.clear();
   loaded_.clear();
   aliases_.Clear();
+  aliasesRead_ = false;
+  listChanges_ = 0;
   deployed_.clear();
   errorText_.clear();
 }

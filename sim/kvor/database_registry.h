@@ -94,7 +94,11 @@ class DatabaseRegistry {
   // What went wrong in the latest open, save or alias that failed on a file.
   std::string ErrorText() const;
   size_t LoadedCount() const;
-  // Unloads every database and forgets every alias.
+  // The next `count` reads of the list find that it changed since its sizes were taken.
+  void ChangeListOnRead(int32_t count);
+
+  // Unloads every database, forgets what was deployed, and reads the aliases from their file
+  // again at their next use.
   void Reset();
 
  private:
@@ -122,6 +126,9 @@ class DatabaseRegistry {
   Status Fail(Status status, std::string text);
   // The alias list of `target` (0: this machine), or null for a null address text.
   const DatabaseAliases *ListOf(uint64_t target);
+  // The aliases, read from their file at the first use after a reset.
+  DatabaseAliases &Aliases();
+  Status SaveAliases();
 
   mutable std::mutex mutex_;
   std::map<std::string, std::unique_ptr<tLoaded>> loaded_;  // by key
@@ -131,6 +138,8 @@ class DatabaseRegistry {
   std::unordered_map<uint32_t, Status> errorObjects_;
   uint32_t lastErrorNumber_ = 0;
   DatabaseAliases aliases_;
+  bool aliasesRead_ = false;
+  int32_t listChanges_ = 0;
   std::map<std::string, DatabaseAliases> deployed_;  // by IP address
   std::string errorText_;
 };

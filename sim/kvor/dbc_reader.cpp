@@ -35,7 +35,8 @@ bool IsStatementWord(const std::string &word) {
 
 class cDbcParser {
  public:
-  cDbcParser(std::string_view text, tDatabase *database) : lexer_(text), database_(database) {}
+  cDbcParser(std::string_view text, tDatabase *database, std::vector<tDbcError> *warnings)
+      : lexer_(text), database_(database), warnings_(warnings) {}
 
   void Run();
 
@@ -45,6 +46,10 @@ class cDbcParser {
   // where the one before it ended, or the line ended early. (A string may run over lines.)
   tDbcToken Take(Kind kind, const char *what, uint32_t line = 0, char punctuation = 0);
   bool PeekPunctuation(char c);
+  // Takes the ';' that ends a statement. Files of other tools leave it out at the end of a line;
+  // a next statement that starts a line of its own ends the statement all the same.
+  void EndStatement(const char *what);
+  void Warn(uint32_t line, std::string message);
   // Whether the next token goes on the line where the last one ended.
   bool OnLine();
 
@@ -60,6 +65,7 @@ class cDbcParser {
   void ReadComment(uint32_t line);
   void ReadValueNames(uint32_t line);
   void ReadValueTable(uint32_t line);
+  void ReadAttributeDefinition(uint32_t line);
   void ReadAttributeDefault(uint32_t line);
   void ReadAttribute(uint32_t line);
   void ReadSignalType(uint32_t line);
@@ -72,6 +78,7 @@ class cDbcParser {
   tFrame *FrameOf(const tDbcToken &id);
   tSignal *SignalOf(const tDbcToken &id, const tDbcToken &name);
   tEcu *EcuOf(const tDbcToken &name);
+  tAttributeDefinition *DefinitionOf(const std::string &name);
 
   cDbcLexer lexer_;
   tDatabase *database_;
@@ -79,6 +86,8 @@ class cDbcParser {
   tFrame *currentFrame_ = nullptr;  // the frame whose signals may follow
   std::map<uint32_t, tFrame *> framesById_;  // by the identifier as the file writes it
   std::map<const tFrame *, uint32_t> frameLines_;
+  std::map<const tSignal *, uint32_t> signalLines_;
+  std::vector<tDbcError> *warnings_;
   std::set<const tFrame *> cycleTimeSet_;
   std::set<const tSignal *> startValueSet_;
   std::optional<double> defaultCycleTime_;
@@ -95,12 +104,35 @@ tDbcToken cDbcParser::Take(Kind kind, const char *what, uint32_t line, char punc
   if (token.kind != kind || (punctuation != 0 && token.text[0] != punctuation)) {
     Fail(token.line, std::string("expected ") + what + ", found " + DescribeToken(token));
   }
+  if (kind == Kind::kIdentifier && token.text[0] >= '0' && token.text[0] <= '9') {
+    Warn(token.line, "name '" + token.text + "' starts with a digit");
+  }
   return token;
 }
 
 bool cDbcParser::PeekPunctuation(char c) {
   const tDbcToken &token = lexer_.Peek();
   return token.kind == Kind::kPunctuation && token.text[0] == c;
+}
+
+void cDbcParser::Warn(uint32_t line, std::string message) {
+  if (warnings_ != nullptr) warnings_->push_back(tDbcError{line, std::move(message)});
+}
+
+void cDbcParser::EndStatement(const char *what) {
+  if (PeekPunctuation(';')) {
+    lexer_.Next();
+    return;
+  }
+  const tDbcToken &next = lexer_.Peek();
+  const uint32_t line = lexer_.LastLine();
+  if (next.kind == Kind::kEnd ||
+      (next.kind == Kind::kIdentifier && next.line != line && next.column == 0 &&
+       IsStatementWord(next.text))) {
+    Warn(line, std::string("no ';' ") + what);
+    return;
+  }
+  Take(Kind::kPunctuation, (std::string("';' ") + what).c_str(), 0, ';');
 }
 
 bool cDbcParser::OnLine() {
@@ -170,6 +202,8 @@ void cDbcParser::Run() {
       ReadValueNames(line);
     } else if (word == "VAL_TABLE_") {
       ReadValueTable(line);
+    } else if (word == "BA_DEF_") {
+      ReadAttributeDefinition(line);
     } else if (word == "BA_DEF_DEF_") {
       ReadAttributeDefault(line);
     } else if (word == "BA_") {
@@ -302,7 +336,7 @@ void cDbcParser::ReadSignal(uint32_t line) {
   if (signal.mux == MuxRole::kMultiplexer && FindMultiplexer(*currentFrame_) != nullptr) {
     Fail(line, "a second multiplexer in the frame");
   }
-  currentFrame_->signals.push_back(std::move(signal));
+  signalLines_[&currentFrame_->signals.emplace_back(std::move(signal))] = line;
 }
 
 tFrame *cDbcParser::FrameOf(const tDbcToken &id) {
@@ -350,7 +384,7 @@ void cDbcParser::ReadComment(uint32_t line) {
   }
   const std::string text = Take(Kind::kString, "the comment text").text;
   if (target != nullptr) *target = text;
-  Take(Kind::kPunctuation, "';' after the comment", 0, ';');
+  EndStatement("after the comment");
 }
 
 std::vector<tValueName> cDbcParser::ReadValuePairs(uint32_t line) {
@@ -386,19 +420,61 @@ void cDbcParser::ReadValueTable(uint32_t line) {
   cluster_->valueTables.push_back(std::move(table));
 }
 
+tAttributeDefinition *cDbcParser::DefinitionOf(const std::string &name) {
+  for (tAttributeDefinition &definition : cluster_->attributeDefinitions) {
+    if (definition.name == name) return &definition;
+  }
+  return nullptr;
+}
+
+void cDbcParser::ReadAttributeDefinition(uint32_t line) {
+  tAttributeDefinition definition;
+  if (lexer_.Peek().kind == Kind::kIdentifier) definition.objectKind = lexer_.Next().text;
+  definition.name = Take(Kind::kString, "the attribute name", line).text;
+  definition.type = Take(Kind::kIdentifier, "the attribute type", line).text;
+  const std::string &type = definition.type;
+  if (type == "INT" || type == "HEX" || type == "FLOAT") {
+    definition.minimum = Take(Kind::kNumber, "the attribute's minimum", line).text;
+    definition.maximum = Take(Kind::kNumber, "the attribute's maximum", line).text;
+  } else if (type == "ENUM") {
+    while (lexer_.Peek().kind == Kind::kString) {
+      definition.enumTexts.push_back(lexer_.Next().text);
+      if (!PeekPunctuation(',')) break;
+      lexer_.Next();
+    }
+  } else if (type != "STRING") {
+    Fail(line, "unknown attribute type '" + type + "'");
+  }
+  EndStatement("after the attribute definition");
+  // A name defined again is defined as it was last.
+  if (tAttributeDefinition *known = DefinitionOf(definition.name)) {
+    *known = std::move(definition);
+  } else {
+    cluster_->attributeDefinitions.push_back(std::move(definition));
+  }
+}
+
 void cDbcParser::ReadAttributeDefault(uint32_t line) {
   const std::string name = Take(Kind::kString, "the attribute name").text;
   const tDbcToken value = lexer_.Next();
   if (value.kind == Kind::kEnd) Fail(line, "the text ends before the attribute's default");
+  if (value.kind != Kind::kNumber && value.kind != Kind::kString) {
+    Fail(value.line, "expected the attribute's default, found " + DescribeToken(value));
+  }
+  // A default of no definition describes nothing.
+  if (tAttributeDefinition *definition = DefinitionOf(name)) {
+    definition->defaultValue = tAttributeValue{value.text, value.kind == Kind::kString};
+  }
   if (name == kAttrCycleTime) defaultCycleTime_ = ToDouble(value, "cycle time");
   if (name == kAttrStartValue) defaultStartValue_ = ToDouble(value, "start value");
-  Take(Kind::kPunctuation, "';' after the attribute's default", 0, ';');
+  EndStatement("after the attribute's default");
 }
 
 void cDbcParser::ReadAttribute(uint32_t line) {
   const std::string name = Take(Kind::kString, "the attribute name").text;
   tFrame *frame = nullptr;
   tSignal *signal = nullptr;
+  tEcu *ecu = nullptr;
   bool onCluster = true;
   if (lexer_.Peek().kind == Kind::kIdentifier) {
     onCluster = false;
@@ -408,8 +484,10 @@ void cDbcParser::ReadAttribute(uint32_t line) {
     } else if (kind == "SG_") {
       const tDbcToken id = Take(Kind::kNumber, "the frame identifier");
       signal = SignalOf(id, Take(Kind::kIdentifier, "the signal name"));
-    } else if (kind == "BU_" || kind == "EV_") {
-      Take(Kind::kIdentifier, "the object name");
+    } else if (kind == "BU_") {
+      ecu = EcuOf(Take(Kind::kIdentifier, "the node name"));
+    } else if (kind == "EV_") {
+      Take(Kind::kIdentifier, "the variable name");
     } else {
       Fail(line, "attribute of an unknown kind of object '" + kind + "'");
     }
@@ -419,6 +497,12 @@ void cDbcParser::ReadAttribute(uint32_t line) {
     Fail(value.kind == Kind::kEnd ? line : value.line,
          "expected the attribute's value, found " + DescribeToken(value));
   }
+  tAttributeValues *values = onCluster ? &cluster_->attributes
+                             : frame != nullptr ? &frame->attributes
+                             : signal != nullptr ? &signal->attributes
+                             : ecu != nullptr ? &ecu->attributes
+                                              : nullptr;
+  if (values != nullptr) (*values)[name] = tAttributeValue{value.text, value.kind == Kind::kString};
   if (frame != nullptr && name == kAttrCycleTime) {
     frame->cycleTimeMs = ToDouble(value, "cycle time");
     cycleTimeSet_.insert(frame);
@@ -437,7 +521,7 @@ void cDbcParser::ReadAttribute(uint32_t line) {
   } else if (onCluster && name == kAttrClusterName && value.kind == Kind::kString) {
     cluster_->name = value.text;
   }
-  Take(Kind::kPunctuation, "';' after the attribute", 0, ';');
+  EndStatement("after the attribute");
 }
 
 void cDbcParser::ReadSignalType(uint32_t line) {
@@ -453,7 +537,7 @@ void cDbcParser::ReadSignalType(uint32_t line) {
     }
     signal->type = SignalType::kFloat;
   }
-  Take(Kind::kPunctuation, "';' after the value type", 0, ';');
+  EndStatement("after the value type");
 }
 
 // A statement that the database has no use for ends at its ';', or where a line starts at its
@@ -480,17 +564,31 @@ void cDbcParser::Finish() {
       }
       multiplexed = multiplexed || signal.mux == MuxRole::kMultiplexed;
     }
-    if (multiplexed && FindMultiplexer(frame) == nullptr) {
+    const tSignal *multiplexer = FindMultiplexer(frame);
+    if (multiplexed && multiplexer == nullptr) {
       Fail(frameLines_[&frame], "frame '" + frame.name + "' has multiplexed signals and no multiplexer");
     }
+    for (const tSignal &signal : frame.signals) {
+      if (signal.mux == MuxRole::kMultiplexed && multiplexer->numBits < 32 &&
+          signal.muxValue >> multiplexer->numBits != 0) {
+        Fail(signalLines_[&signal], "signal '" + signal.name + "' is selected by " +
+                                        std::to_string(signal.muxValue) + ", which multiplexer '" +
+                                        multiplexer->name + "' of " +
+                                        std::to_string(multiplexer->numBits) + " bits cannot take");
+      }
+    }
+    AddMissingSubframes(&frame);
   }
 }
 
 }  // namespace
 
-bool ReadDbc(std::string_view text, tDatabase *database, tDbcError *error) {
+bool ReadDbc(std::string_view text, tDatabase *database, tDbcError *error,
+             std::vector<tDbcError> *warnings) {
   try {
-    cDbcParser parser(text, database);
+    constexpr std::string_view kByteOrderMark = "\xEF\xBB\xBF";
+    if (text.substr(0, kByteOrderMark.size()) == kByteOrderMark) text.remove_prefix(kByteOrderMark.size());
+    cDbcParser parser(text, database, warnings);
     parser.Run();
     return true;
   } catch (const tDbcSyntaxError &failure) {

@@ -5,6 +5,7 @@
 #include <cstdint>
 #include <string>
 #include <string_view>
+#include <vector>
 
 #include "database_model.h"
 
@@ -18,8 +19,11 @@ struct tDbcError {
 
 // Reads `text` into *database, which is replaced. Statements that the database has no use for
 // are skipped whole. Returns false with *error filled for a text that does not follow the format;
-// *database is then unspecified.
-bool ReadDbc(std::string_view text, tDatabase *database, tDbcError *error);
+// *database is then unspecified. What files of other tools break in small ways and every reader
+// accepts (a byte order mark, a name that starts with a digit, a statement that the next line
+// ends instead of its ';') is read, with a warning in *warnings if that is not null.
+bool ReadDbc(std::string_view text, tDatabase *database, tDbcError *error,
+             std::vector<tDbcError> *warnings = nullptr);
 
 }  // namespace nKvorSim
 

@@ -94,6 +94,13 @@ tDbcToken cDbcLexer::Scan() {
       }
     }
     token.kind = tDbcToken::kNumber;
+    // Files of other tools give names that start with a digit ("2ndGear"): digits that run on
+    // into a letter or '_' are a name.
+    if (IsDigit(c) && IsIdentifierStart(at(position_)) &&
+        text_.substr(start, position_ - start).find('.') == std::string_view::npos) {
+      while (IsIdentifierPart(at(position_))) ++position_;
+      token.kind = tDbcToken::kIdentifier;
+    }
   } else if (c == '"') {
     ++position_;
     std::string value;

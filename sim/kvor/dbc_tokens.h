@@ -1,4 +1,4 @@
-// The words of a CAN database file: identifiers, numbers, quoted strings (which may run over
+// The words of a CAN database file: identifiers (which may start with a digit), numbers, quoted strings (which may run over
 // lines, with \" and \\ escaped) and single punctuation characters, each with its place.
 #ifndef KVOR_SIM_DBC_TOKENS_H
 #define KVOR_SIM_DBC_TOKENS_H

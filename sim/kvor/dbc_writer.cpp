@@ -2,6 +2,7 @@
 
 #include <charconv>
 
+#include "dbc_attribute_values.h"
 #include "dbc_attributes.h"
 #include "signal_codec.h"
 
@@ -9,12 +10,7 @@ namespace nKvorSim {
 
 namespace {
 
-// The shortest text that reads back to the same double.
-std::string Number(double value) {
-  char buffer[32];
-  const auto result = std::to_chars(buffer, buffer + sizeof buffer, value);
-  return std::string(buffer, result.ptr);
-}
+std::string Number(double value) { return NumberText(value); }
 
 std::string Quoted(const std::string &text) {
   std::string quoted = "\"";
@@ -49,19 +45,19 @@ const char *MuxMark(const tSignal &signal, std::string *scratch) {
 
 bool Check(const tCluster &cluster, std::string *error) {
   for (const tEcu &ecu : cluster.ecus) {
-    if (!IsIdentifier(ecu.name)) {
+    if (!IsFileName(ecu.name)) {
       *error = "ECU name '" + ecu.name + "' is not an identifier";
       return false;
     }
   }
   for (const tFrame &frame : cluster.frames) {
-    if (!IsIdentifier(frame.name) || !IsValidPayloadLength(frame.payloadLength) ||
+    if (!IsFileName(frame.name) || !IsValidPayloadLength(frame.payloadLength) ||
         frame.id > MaxFrameId(frame.extended)) {
       *error = "frame '" + frame.name + "' cannot be written";
       return false;
     }
     for (const tSignal &signal : frame.signals) {
-      if (!IsIdentifier(signal.name) || !SignalFits(signal, frame.payloadLength)) {
+      if (!IsFileName(signal.name) || !SignalFits(signal, frame.payloadLength)) {
         *error = "signal '" + signal.name + "' of frame '" + frame.name + "' cannot be written";
         return false;
       }
@@ -70,22 +66,46 @@ bool Check(const tCluster &cluster, std::string *error) {
   return true;
 }
 
-void WriteAttributeDefinitions(const tCluster &cluster, std::string &out) {
-  out += "BA_DEF_ " + Quoted(std::string(kAttrBaudRate)) + " INT 0 1000000000;\n";
-  out += "BA_DEF_ " + Quoted(std::string(kAttrFdBaudRate)) + " INT 0 1000000000;\n";
-  out += "BA_DEF_ " + Quoted(std::string(kAttrClusterName)) + " STRING ;\n";
-  out += "BA_DEF_ BO_ " + Quoted(std::string(kAttrCycleTime)) + " FLOAT 0 3600000;\n";
-  out += "BA_DEF_ BO_ " + Quoted(std::string(kAttrFrameFormat)) +
-         " ENUM \"StandardCAN\",\"ExtendedCAN\"";
-  for (uint32_t i = kFormatExtendedCan + 1; i < kFormatStandardCanFd; ++i) out += ",\"reserved\"";
-  out += ",\"StandardCAN_FD\",\"ExtendedCAN_FD\";\n";
-  out += "BA_DEF_ SG_ " + Quoted(std::string(kAttrStartValue)) + " FLOAT -1e308 1e308;\n";
-  out += "BA_DEF_DEF_ " + Quoted(std::string(kAttrCycleTime)) + " 0;\n";
-  out += "BA_DEF_DEF_ " + Quoted(std::string(kAttrStartValue)) + " 0;\n";
-  out += "BA_ " + Quoted(std::string(kAttrBaudRate)) + " " + std::to_string(cluster.baudRate) + ";\n";
-  out += "BA_ " + Quoted(std::string(kAttrFdBaudRate)) + " " + std::to_string(cluster.fdBaudRate) +
-         ";\n";
-  out += "BA_ " + Quoted(std::string(kAttrClusterName)) + " " + Quoted(cluster.name) + ";\n";
+std::string AttributeValue(const tAttributeValue &value) {
+  return value.quoted ? Quoted(value.text) : value.text;
+}
+
+void WriteAttributeValues(const std::string &object, const tAttributeValues &values,
+                          std::string &out) {
+  for (const auto &[name, value] : values) {
+    out += "BA_ " + Quoted(name) + object + " " + AttributeValue(value) + ";\n";
+  }
+}
+
+void WriteAttributes(const tCluster &cluster, std::string &out) {
+  const std::vector<tAttributeDefinition> definitions = AttributeDefinitions(cluster);
+  for (const tAttributeDefinition &definition : definitions) {
+    out += "BA_DEF_ " + (definition.objectKind.empty() ? "" : definition.objectKind + " ") +
+           Quoted(definition.name) + " " + definition.type;
+    if (definition.type == "ENUM") {
+      for (size_t i = 0; i < definition.enumTexts.size(); ++i) {
+        out += (i == 0 ? " " : ",") + Quoted(definition.enumTexts[i]);
+      }
+    } else if (definition.type != "STRING") {
+      out += " " + definition.minimum + " " + definition.maximum;
+    }
+    out += ";\n";
+  }
+  for (const tAttributeDefinition &definition : definitions) {
+    if (definition.defaultValue) {
+      out += "BA_DEF_DEF_ " + Quoted(definition.name) + " " +
+             AttributeValue(*definition.defaultValue) + ";\n";
+    }
+  }
+  WriteAttributeValues("", ClusterAttributes(cluster), out);
+  for (const tEcu &ecu : cluster.ecus) WriteAttributeValues(" BU_ " + ecu.name, EcuAttributes(ecu), out);
+  for (const tFrame &frame : cluster.frames) {
+    const std::string id = WrittenId(frame);
+    WriteAttributeValues(" BO_ " + id, FrameAttributes(cluster, frame), out);
+    for (const tSignal &signal : frame.signals) {
+      WriteAttributeValues(" SG_ " + id + " " + signal.name, SignalAttributes(cluster, signal), out);
+    }
+  }
 }
 
 }  // namespace
@@ -96,6 +116,10 @@ bool WriteDbc(const tDatabase &database, std::string *text, std::string *error) 
     return false;
   }
   const tCluster &cluster = database.clusters.front();
+  if (!cluster.linSchedules.empty()) {
+    *error = "a database file holds no LIN schedule";
+    return false;
+  }
   if (!Check(cluster, error)) return false;
 
   std::string out = "VERSION " + Quoted(database.version) + "\n\n";
@@ -143,26 +167,7 @@ bool WriteDbc(const tDatabase &database, std::string *text, std::string *error) 
     }
   }
 
-  WriteAttributeDefinitions(cluster, out);
-  for (const tFrame &frame : cluster.frames) {
-    const std::string id = WrittenId(frame);
-    if (frame.cycleTimeMs != 0.0) {
-      out += "BA_ \"" + std::string(kAttrCycleTime) + "\" BO_ " + id + " " +
-             Number(frame.cycleTimeMs) + ";\n";
-    }
-    // A short payload alone does not say CAN FD.
-    if (frame.format == FrameFormat::kCanFd) {
-      const uint32_t format = frame.extended ? kFormatExtendedCanFd : kFormatStandardCanFd;
-      out += "BA_ \"" + std::string(kAttrFrameFormat) + "\" BO_ " + id + " " +
-             std::to_string(format) + ";\n";
-    }
-    for (const tSignal &signal : frame.signals) {
-      if (signal.defaultRaw != 0.0) {
-        out += "BA_ \"" + std::string(kAttrStartValue) + "\" SG_ " + id + " " + signal.name + " " +
-               Number(signal.defaultRaw) + ";\n";
-      }
-    }
-  }
+  WriteAttributes(cluster, out);
   for (const tFrame &frame : cluster.frames) {
     for (const tSignal &signal : frame.signals) {
       if (!signal.valueNames.empty()) {

@@ -10,8 +10,9 @@
 namespace nKvorSim {
 
 // The text of `database` in *text. Returns false, with the reason in *error, for a database
-// that the file format cannot hold: not exactly one cluster, a name that is not an identifier, a
-// signal outside its frame.
+// that the file format cannot hold: not exactly one cluster, a LIN schedule, a name that is not
+// an identifier, a signal outside its frame. Attributes are written with the definitions and
+// values of the database (see dbc_attribute_values.h).
 bool WriteDbc(const tDatabase &database, std::string *text, std::string *error);
 
 }  // namespace nKvorSim

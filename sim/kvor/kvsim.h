@@ -213,14 +213,25 @@
  *                     by any name, is the same database with the same handle; it stays loaded
  *                     until it has been closed as often as it was opened (closeAll: at once).
  *                     Database object handles are 0x8CIIIIII, C the class number (0 database, 1
- *                     cluster, 2 frame, 3 signal, 5 ECU, 8 PDU). Properties: names, comments,
+ *                     cluster, 2 frame, 3 signal, 4 subframe, 5 ECU, 6 LIN schedule, 7 LIN
+ *                     schedule entry, 8 PDU). A multiplexed frame has one subframe per value of
+ *                     its multiplexer that selects signals, named "m" and the value (found in
+ *                     the cluster as "Frame.m2"). LIN schedules and their entries are made by
+ *                     callers only; a database that has one cannot be saved. Aliases are kept
+ *                     in "kvorAliases.txt" of the directory KVSIM_CONFIG_DIR, else of "kvor" in
+ *                     the user's configuration directory; tests that add aliases set it.
+ *                     kvdbGetDBCAttribute gives an enumeration's value as its text; a
+ *                     warning about what a file from another tool broke is left in
+ *                     kvsimDatabaseErrorText after a good open. Properties: names, comments,
  *                     frame ID, CANExtID, PayloadLen, CANTxTime, CANioMode (0 CAN, 1 CAN FD),
  *                     signal StartBit, NumBits, ByteOrdr (0 little-endian, 1 big-endian),
  *                     DataType (0 signed, 1 unsigned, 2 IEEE float), ScaleFac, ScaleOff, Min,
  *                     Max, Default, Unit, Mux* can be set; references, DefaultPayload,
  *                     ConfigStatus, NameUniqueToCluster ("frame.signal") and the PDU's follow
  *                     from them. A frame's PDU is the frame's payload: one PDU per frame at
- *                     start bit 0 with update bit 0xFFFFFFFF (none). Subframes are not served.
+ *                     start bit 0 with update bit 0xFFFFFFFF (none). Subframes, LIN schedules and
+ *                     their entries answer their names, cluster references and the references
+ *                     between them only.
  *   kvdbCloseDatabase Answers kvsimErrInvalidDatabase for a handle of no loaded database.
  *   Error handles     kvBlink and kvdbCloseDatabase also answer an error session, given in place
  *                     of their object, with its status, as the session calls do.
@@ -356,8 +367,9 @@ enum kvsimBlinkMode { kvsimBlinkOff = 0, kvsimBlinkOn = 1 };
  * return kvsimErrSessionCleared), closes every system, stops every interface, turns every
  * interface's light off, lifts every hold (held calls that wait on no session go on), drops
  * injected failures, the call log (and turns it on), the signal values, the frames and the raised
- * conditions, numbers frames from 1 again, unloads every database, forgets every database alias,
- * and sets the clock to 0. Handle generations keep counting, so a handle of before the reset
+ * conditions, numbers frames from 1 again, unloads every database, forgets what was deployed to
+ * targets, reads the database aliases from their file again (they outlive a reset as they outlive
+ * the process), and sets the clock to 0. Handle generations keep counting, so a handle of before the reset
  * stays invalid. */
 KVSIM_API void kvsimReset(void);
 
@@ -677,6 +689,11 @@ KVSIM_API int32_t kvsimDatabaseErrorText(char *text, uint32_t size);
 
 /* Number of databases loaded: opened and not yet closed as often. */
 KVSIM_API int32_t kvsimLoadedDatabaseCount(void);
+
+/* The next `count` calls of kvdbGetDatabaseList (0 or less: none) find the list changed since
+ * its sizes were taken: each returns kvErrDatabaseListChanged and copies nothing. A reset ends
+ * it. */
+KVSIM_API void kvsimChangeDatabaseList(int32_t count);
 
 #ifdef __cplusplus
 }

@@ -122,7 +122,7 @@ TEST_F(KvorDatabase, AFaultyTextIsRefusedWithItsLineNamed) {
       {kFrame + " SG_ S : 0|8@1+ (1,0)\n", 6, "ends before '['"},
       {kFrame + " SG_ S : 0|8@1+ (1,0)\n" + kFrame, 6, "line ends before '['"},
       {"BO_ 100 F:\n" + kSignal, 5, "line ends before the payload"},
-      {kFrame + " SG_ S : 0|8@1+ (1x,0) [0|255] \"\" B\n", 6, "after the scale"},
+      {kFrame + " SG_ S : 0|8@1+ (1x,0) [0|255] \"\" B\n", 6, "expected the scale"},
       {kFrame + " SG_ S : 0.5|8@1+ (1,0) [0|255] \"\" B\n", 6, "bad start bit '0.5'"},
       {kFrame + " SG_ S : 0|8@2+ (1,0) [0|255] \"\" B\n", 6, "bad byte order"},
       {"BO_ 99999999999 F: 8 A\n", 5, "bad frame identifier"},
