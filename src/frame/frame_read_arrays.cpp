@@ -23,6 +23,14 @@ uint64_t ArrayBytes(int32_t n, uint32_t width) {
 
 }  // namespace
 
+Status FitPayload(SvHandle payload, uint32_t length, int32_t payloadMax) {
+  if (svGetHandleSize(payload) >= uint64_t{length} + kPayloadHeader) return 0;
+  SvHandle grown = payload;
+  return ResizeOrCreateHandle(
+      &grown, static_cast<uint64_t>(std::max<int64_t>(PayloadHandleBytes(payloadMax),
+                                                      int64_t{length} + kPayloadHandleExtra)));
+}
+
 uint64_t cFrameArrays::ProbeCapacity() const {
   if (FrameCount() != 0 && Payload(0) != nullptr) return svGetHandleSize(Payload(0));
   if (SpareCount() != 0 && Spare(0) != nullptr) return svGetHandleSize(Spare(0));

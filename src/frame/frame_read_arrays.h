@@ -33,6 +33,12 @@ inline bool CapacityHolds(uint64_t capacity, int32_t payloadMax) {
   return static_cast<int64_t>(capacity) >= PayloadHandleBytes(payloadMax);
 }
 
+// Makes `payload` (not null) take `length` bytes behind its count. The size of one handle stands
+// for the others only while a host program keeps them alike; one that is too small is grown here
+// as new handles are made, to the session's `payloadMax` (or the length, if that is more), so that
+// no copy runs past it. 0 when it fits; otherwise the resize helper's failure, the handle as it was.
+Status FitPayload(SvHandle payload, uint32_t length, int32_t payloadMax);
+
 class cFrameArrays {
  public:
   // Both pointers must be valid; the handles behind them may be null.

@@ -62,9 +62,16 @@ Status Prepare(const tSessionSlot &slot, const cFrameArrays &arrays, int32_t n, 
       status = ReportInternalError(kComponentKvsvapi, nFile::kSessionIo, __LINE__, 0);
       continue;
     }
+    // The driver writes up to the limit into each handle, so each must take that much.
+    const uint32_t limit = static_cast<uint32_t>(std::max(slot.cachedSamples, 0));
+    const Status fitted = FitPayload(payload, limit, slot.cachedSamples);
+    if (fitted < 0) {
+      status = fitted;
+      continue;
+    }
     descriptors[i].data =
         reinterpret_cast<uintptr_t>(static_cast<uint8_t *>(*payload) + kPayloadHeader);
-    descriptors[i].length = static_cast<uint32_t>(slot.cachedSamples);
+    descriptors[i].length = limit;
   }
   return status;
 }

@@ -27,7 +27,8 @@ using tRecordDecode = void (*)(const uint8_t *record, uint8_t *cluster);
 
 // Decodes the records of `records` (`bytes` of `bufferSize` filled) into the frames from element
 // 0 on: elements below the frames' count keep their own payload handle, later ones take a spare.
-// Updates `status` as the records demand and returns the number of frames delivered. A frame that
+// Each handle is sized before its copy, whatever the others' sizes; a handle that cannot be grown
+// gets no payload and its failure. Updates `status` as the records demand and returns the number of frames delivered. A frame that
 // finds no spare left is reported as coming from `reportLine`.
 template <eRecordForm kForm, ePayloadRule kRule, tRecordDecode kDecode>
 int32_t WalkRecords(const cFrameArrays &arrays, uint8_t *records, uint32_t bytes,
@@ -64,7 +65,13 @@ int32_t WalkRecords(const cFrameArrays &arrays, uint8_t *records, uint32_t bytes
           status = kvErrPayloadTruncated;
           record[kRecordPayloadLength] = static_cast<uint8_t>(payloadMax);
         }
-        StorePayload(payload, record + kRecordPayload, record[kRecordPayloadLength]);
+        const uint8_t length = record[kRecordPayloadLength];
+        const Status fitted = FitPayload(payload, length, payloadMax);
+        if (fitted < 0) {
+          status = fitted;
+        } else {
+          StorePayload(payload, record + kRecordPayload, length);
+        }
       } else {
         const uint32_t length = RecordPayloadLength(record);
         bool fits = true;
@@ -74,6 +81,11 @@ int32_t WalkRecords(const cFrameArrays &arrays, uint8_t *records, uint32_t bytes
           status = ResizeOrCreateHandle(&payload, uint64_t{length} + kPayloadHandleExtra);
           fits = status == 0;
           if (fits) arrays.Payload(i) = payload;
+        }
+        if (fits) {
+          const Status fitted = FitPayload(payload, length, payloadMax);
+          if (fitted < 0) status = fitted;
+          fits = fitted >= 0;
         }
         if (fits) StorePayload(payload, record + kRecordPayload, length);
       }

@@ -146,6 +146,74 @@ TEST_F(FrameTest, ReadHandsSurplusHandlesToTheSparesAndTakesThemBackLastInFirstO
   }
 }
 
+// A payload handle of the host's own, with room for its count and one byte, swapped in for the
+// spare that the last read left: the next frame that takes it must not be copied past it.
+TEST_F(FrameTest, ReadGrowsAPayloadHandleSmallerThanTheOthersBeforeItsCopy) {
+  const struct {
+    const tProtocol *p;
+    uint32_t property, limit;  // set on the reader if not 0
+    uint32_t grown;            // the size a new handle of the session has
+  } cases[] = {{&kCan, 0, 0, 15},
+               {&kCan, kvPropSession_IntfCanIoMode, 0, 71},
+               {&kCan, kvPropSession_ApplicationProtocol, 0, 71},
+               {&kLin, 0, 0, 15},
+               {&kFlexRay, 0, 0, 261},
+               {&kEthernet, 0, 60, 67}};
+  for (const auto &c : cases) {
+    SCOPED_TRACE(testing::Message() << c.p->name << " " << c.property);
+    Open(*c.p, c.property);
+    if (c.limit != 0) SetU32(reader_, kvPropSession_PayldLenMax, c.limit);
+    Send(1, 0);
+    ASSERT_EQ(Read(2), 0);
+    ASSERT_EQ(Count(arrays_->spares), 1);
+    SvHandle small = svNewHandleClr(5);
+    svDisposeHandle(arrays_->Spares()[0]);
+    std::memcpy(static_cast<uint8_t *>(*arrays_->spares) + 8, &small, sizeof small);
+    svsimResetCounters();
+    Send(2, 40);
+    ASSERT_EQ(Read(2), 0);
+    ASSERT_EQ(Frames(), 2);
+    EXPECT_EQ(arrays_->Payload(1), small);
+    EXPECT_EQ(svGetHandleSize(small), c.grown);
+    EXPECT_EQ(arrays_->PayloadOf(1), Pattern(8, 41));
+    EXPECT_EQ(svsimResizeCount(), 1u);
+    EXPECT_EQ(svsimAllocCount(), 0u);
+  }
+}
+
+// A program that keeps one pair of arrays for a CAN FD and a classic CAN session in turn: the
+// classic read adds handles for 8 bytes, which the next CAN FD read fills with 64.
+TEST_F(FrameTest, ReadOfCanFdGrowsTheHandlesThatAClassicReadAddedToTheSameArrays) {
+  Open(kCan, kvPropSession_IntfCanIoMode);
+  const uint32_t classic = MakeSession("", kvMode_FrameInQueued, kCan.in);
+  const auto fd = [](int count) {
+    tBytes records;
+    for (int i = 0; i < count; ++i)
+      records = Join({records, Record(0x300 + i, 0, 0, 0, 64, Pattern(64, uint8_t(i)), 80)});
+    return records;
+  };
+  Serve(fd(1));
+  ASSERT_EQ(Read(1), 0);
+  tBytes classicRecords;
+  for (int i = 0; i < 3; ++i)
+    classicRecords = Join({classicRecords, Record(0x100 + i, 0, 0, 0, 8, Pattern(8, 0), 24)});
+  ASSERT_EQ(kvsimSetReadStream(classic, classicRecords.data(), uint32_t(classicRecords.size()), 0), 0);
+  ASSERT_EQ(kvsvReadFrameCAN(classic, 3, &arrays_->frames, &arrays_->spares, 0.0), 0);
+  ASSERT_EQ(Frames(), 3);
+  EXPECT_EQ(svGetHandleSize(arrays_->Payload(2)), 15u);
+  svsimResetCounters();
+  Serve(fd(3));
+  ASSERT_EQ(Read(3), 0);
+  ASSERT_EQ(Frames(), 3);
+  for (int32_t i = 0; i < 3; ++i) {
+    SCOPED_TRACE(i);
+    EXPECT_EQ(arrays_->PayloadOf(i), Pattern(64, uint8_t(i)));
+    EXPECT_EQ(svGetHandleSize(arrays_->Payload(i)), 71u);
+  }
+  EXPECT_EQ(svsimResizeCount(), 2u);
+  EXPECT_EQ(svsimAllocCount(), 0u);
+}
+
 TEST_F(FrameTest, ReadOfAllTakesTheWholeQueueOrWhatIsPendingNow) {
   const struct {
     const tProtocol *p;
