@@ -53,6 +53,19 @@ class cWaveformRead {
       status_ = kvErrOutputMemory;
       return FinishWithData();
     }
+    // The cache knows the array it sized last, not the one passed now: a waveform shorter than the
+    // read would be filled past its end, so such an array is sized again first.
+    if (!HoldsSamples(scratch.descriptors)) {
+      UnlockWaveforms(waveforms_, count_, scratch.descriptors);
+      if (ResizeWaveforms(waveforms_, count_, samples_) != 0) {
+        status_ = kvErrOutputMemory;
+        return FinishWithoutData();
+      }
+      if (LockWaveforms(waveforms_, kLockToFill, count_, scratch.descriptors) != 0) {
+        status_ = kvErrOutputMemory;
+        return FinishWithData();
+      }
+    }
     for (int32_t i = 0; i < count_; ++i) scratch.sampleBuffers[i] = scratch.descriptors[i].samples;
     RegisterAbortIfBlocking(session_, timeout_);
     status_ = kvhdnReadSignalWaveform(session_, timeout_, &rawStart_, &dt_, scratch.sampleBuffers,
@@ -85,6 +98,12 @@ class cWaveformRead {
       return eNext::kWithoutData;
     }
     return eNext::kWithData;
+  }
+
+  bool HoldsSamples(const SvWaveformDescriptor *descriptors) const {
+    for (int32_t i = 0; i < count_; ++i)
+      if (descriptors[i].numSamples < static_cast<uint32_t>(samples_)) return false;
+    return true;
   }
 
   // The array is still locked here when the Lock succeeded.

@@ -101,6 +101,18 @@ TEST_F(SignalTest, WaveformReadsFillTheWaveformsOrLeaveThemAsEachFailureShould) 
   }
 }
 
+// A second array of as many waveforms, each shorter than the read, matches the session's cache:
+// its waveforms are sized before the driver fills them.
+TEST_F(SignalTest, WaveformReadSizesAnotherArrayOfShorterWaveformsBeforeTheDriverFillsIt) {
+  const uint32_t reader = Filling("A,B", kvMode_SignalInWaveform);
+  ASSERT_EQ(kvsvReadSignalWaveform(reader, 3, Waveforms(2, 3), 0.0), 0);
+  SvWaveformArray *shorter = Waveforms(2, 1);
+  ASSERT_EQ(kvsvReadSignalWaveform(reader, 3, shorter, 0.0), 0);
+  ASSERT_EQ(Lengths(shorter), std::vector<size_t>(2, 3));
+  EXPECT_EQ(Samples(shorter, 1), (std::vector<double>{1000.0, 1001.0, 1002.0}));
+  EXPECT_EQ(svsimWaveformCalls(shorter, 6), 1u);
+}
+
 TEST_F(SignalTest, WaveformWritesCutEveryWaveformToTheShortestAndFailuresForgetTheCount) {
   cFakeErrorLog log;
   const uint32_t writer = MakeSession("A,B,C", kvMode_SignalOutWaveform);
