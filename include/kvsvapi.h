@@ -288,7 +288,10 @@ KVSV_EXPORT kvsvStatus kvsvWriteFrameRaw(uint32_t session, SvHandle data, double
  * not grow an array or make a payload handle. 0xBFF63010: a payload handle could not be resized.
  * 0xBFF6309F: a payload longer than the session's limit was delivered cut to it.
  * 0xBFF63015: `frames` or `spareHandles` is null. Otherwise the driver's status, with the frames
- * it delivered. The Ex forms return 0 at once, touching nothing, when `*skip` is non-zero. */
+ * it delivered. The Ex forms return 0 at once, touching nothing, when `*skip` is non-zero.
+ * The arrays may go to several sessions in turn and may hold handles of the program's own: a
+ * payload handle too small for the frame it gets is grown first. A program must not put one
+ * handle in two places of the arrays, nor touch the arrays or their handles while a read runs. */
 
 /* CAN frames, in the session's form: classic, CAN FD up to its payload limit, or J1939 messages
  * of up to 1785 bytes. 0xBFF63090: a single-point session read for fewer frames than its list. */
@@ -498,7 +501,9 @@ struct SvWaveformArray {
  * too) registers kvsvSessionAbort as the program's clean-up before the driver may block.
  * 0xBFF63020, 0xBFF63027: as for kvsvReadSignalSinglePoint, array untouched. 0xBFF630A0: negative
  * `numSamples` with a timeout. 0xBFF630B0: the host refused to resize or lock the array.
- * 0xBFF63015: `waveforms` is null. After a failure before the driver call the array is empty. */
+ * 0xBFF63015: `waveforms` is null. After a failure before the driver call the array is empty.
+ * Another array, or one that another session used, may be passed: waveforms shorter than the read
+ * are resized first. A program must not resize or dispose of the array while a read runs. */
 KVSV_EXPORT kvsvStatus kvsvReadSignalWaveform(uint32_t session, int32_t numSamples,
                                               SvWaveformArray *waveforms, double timeout);
 
