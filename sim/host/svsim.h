@@ -156,6 +156,15 @@ void svsimSetRefStatus(int32_t status);
  * libsvhostbyname.so exports it as svUnregisterRefByName. */
 int32_t svsimUnregisterRefByName(SvHandle name, SvHandle kind, SvHandle className, int32_t c21);
 
+/* The host's open of a reference by its text `text`: calls the export named `openName`, found
+ * in the process, with a string handle of the text, the handle output and context 0, puts what
+ * it gave into *handle, and registers the reference under the text with `className` and the two
+ * export names, so that the end of the program calls `closeName` with the handle. The status of
+ * the registration; SVSIM_REF_NOT_FOUND if no export of that name is in the process (nothing is
+ * called), SVSIM_REF_BAD_ARGUMENT for a null argument. */
+int32_t svsimOpenRefByText(const char *openName, const char *closeName, const char *className,
+                           const char *text, uint32_t *handle);
+
 /* ---- Clean-up procedures -------------------------------------------------------------------- */
 
 /* Calls of svSetCleanupProc since the last reset, whatever ran since. */
