@@ -1,7 +1,10 @@
 // Database files: every frame and signal of each field file reads as a reading of its text apart
-// from the driver's gives it, before and after a save and a load; a faulty text is refused with
-// its line named; what the reader has no use for is skipped and what it knows is read and written
-// back; a file is one database by any name until closed as often as opened.
+// from the driver's gives it, before and after a save and a load, and every object, property and
+// attribute of each comes back from a save; a faulty text is refused with its line named, and
+// the quirks of other tools' files are read; what the reader has no use for is skipped and what
+// it knows is read and written back; a file is one database by any name until closed as often as
+// opened; objects of every class; aliases in their file; merges, deployments and attributes.
+#include <filesystem>
 #include <fstream>
 #include <regex>
 #include <sstream>
@@ -15,6 +18,10 @@ using namespace kvsvtest;
 
 class KvorDatabase : public KvorTest {
  protected:
+  cTempDir directory_;
+  // Aliases go to a file of the test's own.
+  cScopedEnv configDir_{"KVSIM_CONFIG_DIR", directory_.Sub("config")};
+
   // Opens `text` as a database file of its own.
   int32_t OpenText(const std::string &text, uint32_t *handle) {
     const std::string name = "text" + std::to_string(files_++) + ".dbc";
@@ -28,7 +35,6 @@ class KvorDatabase : public KvorTest {
     return OpenDatabase(directory_.Sub(name));
   }
 
-  cTempDir directory_;
   int files_ = 0;
 };
 
@@ -109,6 +115,110 @@ TEST_F(KvorDatabase, FieldFilesReadAsTheirTextSaysBeforeAndAfterASaveAndALoad) {
   }
 }
 
+// The name by which each class of object is known in its cluster.
+const uint32_t kNameIds[] = {kvPropDatabase_Name, kvPropClst_Name, kvPropFrm_Name,
+                             kvPropSig_NameUniqueToCluster, kvPropSubfrm_NameUniqueToCluster,
+                             kvPropECU_Name, kvPropLINSched_Name,
+                             kvPropLINSchedEntry_NameUniqueToCluster, kvPropPDU_Name};
+
+std::string NameOf(uint32_t object) { return DbText(object, kNameIds[(object >> 24) & 0xF]); }
+
+std::string DbcAttribute(uint32_t object, uint32_t mode, const char *name, uint32_t *isDefault) {
+  uint32_t size = 0;
+  if (kvdbGetDBCAttributeSize(object, mode, name, &size) != 0) return "<none>";
+  std::string text(size, '?');
+  EXPECT_EQ(kvdbGetDBCAttribute(object, mode, name, size, text.data(), isDefault), 0) << name;
+  return text.substr(0, size - 1);
+}
+
+// Every property of the object that the driver answers, references by the names of what they
+// point at, then each of its attributes with its value, and whether that is the default.
+std::string Dump(uint32_t object, std::initializer_list<uint32_t> ids, bool attributes = true) {
+  std::ostringstream out;
+  out << NameOf(object) << ":";
+  for (const uint32_t id : ids) {
+    uint32_t size = 0;
+    out << " " << std::hex << id << std::dec << "=";
+    if (kvdbGetPropertySize(object, id, &size) != 0) {
+      out << "-";
+      continue;
+    }
+    switch (id >> 24) {
+      case 3:
+        out << DbText(object, id);
+        break;
+      case 5:
+        out << NameOf(DbRead<uint32_t>(object, id));
+        break;
+      case 6:
+        for (const uint32_t handle : DbHandles(object, id)) out << NameOf(handle) << ",";
+        break;
+      case 9:
+        out << DbRead<uint64_t>(object, id);
+        break;
+      default:
+        for (const double number : Numbers(object, {id})) out << number;
+    }
+  }
+  const std::string names = attributes ? DbcAttribute(object, 2, nullptr, nullptr) : "";
+  std::istringstream list(names);
+  for (std::string name; std::getline(list, name, ',');) {
+    uint32_t isDefault = 7;
+    out << " " << name << "=" << DbcAttribute(object, 0, name.c_str(), &isDefault) << "/"
+        << isDefault;
+  }
+  return out.str();
+}
+
+std::string DumpDatabase(uint32_t database) {
+  const uint32_t cluster = DbCluster(database);
+  std::string all = Dump(cluster, {kvPropClst_Comment, kvPropClst_BaudRate64,
+                                   kvPropClst_CanFdBaudRate64, kvPropClst_CanIoMode,
+                                   kvPropClst_FrmRefs, kvPropClst_SigRefs, kvPropClst_ECURefs,
+                                   kvPropClst_PDURefs, kvPropClst_LINSchedules}) + "\n";
+  for (const uint32_t frame : DbHandles(cluster, kvPropClst_FrmRefs)) {
+    all += Dump(frame, {kvPropFrm_Comment, kvPropFrm_ID, kvPropFrm_CANExtID, kvPropFrm_PayloadLen,
+                        kvPropFrm_CANTxTime, kvPropFrm_CANioMode, kvPropFrm_SigRefs,
+                        kvPropFrm_MuxDataMuxSigRef, kvPropFrm_MuxSubframeRefs,
+                        kvPropFrm_ClusterRef}) + "\n";
+    for (const uint8_t byte : DbBytes(frame, kvPropFrm_DefaultPayload)) all += std::to_string(byte) + " ";
+    for (const uint32_t signal : DbHandles(frame, kvPropFrm_SigRefs)) {
+      all += Dump(signal, {kvPropSig_Comment, kvPropSig_ByteOrdr, kvPropSig_DataType,
+                           kvPropSig_Default, kvPropSig_Min, kvPropSig_Max, kvPropSig_NumBits,
+                           kvPropSig_ScaleFac, kvPropSig_ScaleOff, kvPropSig_StartBit,
+                           kvPropSig_Unit, kvPropSig_MuxIsDataMux, kvPropSig_MuxValue,
+                           kvPropSig_MuxSubfrmRef, 0x05030034}) + "\n";
+    }
+    for (const uint32_t subframe : DbHandles(frame, kvPropFrm_MuxSubframeRefs)) {
+      all += Dump(subframe, {kvPropSubfrm_MuxValue, kvPropSubfrm_DynSigRefs, kvPropSubfrm_FrmRef,
+                             0x05040006}, false) + "\n";
+    }
+  }
+  for (const uint32_t ecu : DbHandles(cluster, kvPropClst_ECURefs)) {
+    all += Dump(ecu, {kvPropECU_Comment, kvPropECU_TxFrmRefs, kvPropECU_RxFrmRefs}) + "\n";
+  }
+  for (const uint32_t pdu : DbHandles(cluster, kvPropClst_PDURefs)) {
+    all += Dump(pdu, {kvPropPDU_SigRefs, kvPropPDU_FrmRefs, kvPropPDU_ClusterRef}, false) + "\n";
+  }
+  return all;
+}
+
+TEST_F(KvorDatabase, EveryFieldFileComesBackFromASaveWithEveryObjectPropertyAndAttribute) {
+  size_t files = 0;
+  for (const auto &entry : std::filesystem::directory_iterator(KVSV_DBC_DIR)) {
+    if (entry.path().extension() != ".dbc") continue;
+    ++files;
+    const std::string file = entry.path().filename();
+    SCOPED_TRACE(file);
+    const uint32_t original = OpenDatabase(entry.path());
+    const std::string before = DumpDatabase(original);
+    const uint32_t reloaded = SavedAndReloaded(original, file);
+    EXPECT_EQ(DumpDatabase(reloaded), before);
+    ASSERT_EQ(kvdbCloseDatabase(original, 1) + kvdbCloseDatabase(reloaded, 1), 0);
+  }
+  EXPECT_EQ(files, 7u);
+}
+
 const std::string kHead = "VERSION \"\"\n\nBU_: A B\n\n";  // lines 1 to 4
 const std::string kFrame = "BO_ 100 F: 8 A\n";             // line 5
 const std::string kSignal = " SG_ S : 0|8@1+ (1,0) [0|255] \"\" B\n";
@@ -142,6 +252,10 @@ TEST_F(KvorDatabase, AFaultyTextIsRefusedWithItsLineNamed) {
       {kFrame + kSignal + kSignal, 7, "defined twice"},
       {kFrame + " SG_ M1 M : 0|2@1+ (1,0) [0|3] \"\" B\n SG_ M2 M : 2|2@1+ (1,0) [0|3] \"\" B\n", 7,
        "second multiplexer"},
+      {kFrame + " SG_ M M : 0|2@1+ (1,0) [0|3] \"\" B\n SG_ S m4 : 8|8@1+ (1,0) [0|1] \"\" B\n", 7,
+       "selected by 4, which multiplexer 'M' of 2 bits cannot take"},
+      {kFrame + "BO_ 100 G: 8 A\n", 6, "used twice"},
+      {kFrame + kSignal + "CM_ BO_ 100 \"x\" BA_ \"A\" 1;\n", 7, "';' after the comment"},
   };
   for (const auto &c : cases) {
     SCOPED_TRACE(c.says);
@@ -230,6 +344,175 @@ TEST_F(KvorDatabase, OneFileByAnyNameIsOneDatabaseUntilClosedAsOftenAsOpened) {
   OpenDatabase("Radar");
   EXPECT_EQ(kvdbCloseDatabase(OpenDatabase("Radar"), 1), 0) << "closeAll, whatever the count";
   EXPECT_EQ(kvsimLoadedDatabaseCount(), 0);
+}
+
+TEST_F(KvorDatabase, QuirksOfOtherToolsAreReadWithAWarningThatNamesTheLine) {
+  const struct {
+    std::string text;
+    const char *warning;  // "" for none
+  } cases[] = {
+      {"\xEF\xBB\xBF" + kHead + kFrame + kSignal, ""},
+      {kHead + "BO_ 100 2F: 8 A\n SG_ 1st : 0|8@1+ (1,0) [0|255] \"\" B\n", "line 5: warning: name '2F'"},
+      {kHead + kFrame + kSignal + "CM_ BO_ 100 \"c\"\nBA_DEF_ BO_ \"X\" INT 0 9\nBA_ \"X\" BO_ 100 3",
+       "line 7: warning: no ';' after the comment"},
+  };
+  for (const auto &c : cases) {
+    SCOPED_TRACE(c.text);
+    uint32_t database = 0;
+    ASSERT_EQ(OpenText(c.text, &database), 0) << DatabaseErrorText();
+    EXPECT_NE(DatabaseErrorText().find(c.warning), std::string::npos) << DatabaseErrorText();
+    const uint32_t copy = SavedAndReloaded(database, "quirk" + std::to_string(files_) + ".dbc");
+    EXPECT_EQ(DumpDatabase(copy), DumpDatabase(database));
+  }
+}
+
+TEST_F(KvorDatabase, ObjectsOfEveryClassAreMadeFoundByTheirNamesAndDeletedWithWhatTheyHold) {
+  const uint32_t database = OpenDatabase(":memory:");
+  uint32_t cluster = 0, frame = 0, signal = 0, schedule = 0, made = 0;
+  ASSERT_EQ(kvdbCreateObject(database, 0x10000, "Body", &cluster), 0);
+  ASSERT_EQ(kvdbCreateObject(cluster, 0x20000, "Door", &frame), 0);
+  ASSERT_EQ(kvdbCreateObject(frame, 0x30000, "Sel", &signal), 0);
+  const uint8_t on = 1;
+  ASSERT_EQ(kvdbSetProperty(signal, kvPropSig_MuxIsDataMux, 1, &on), 0);
+  ASSERT_EQ(kvdbCreateObject(cluster, 0x60000, "Sched", &schedule), 0);
+  const struct {
+    uint32_t parent, objectClass;
+    const char *name, *inCluster;  // the name in the cluster, as its name property gives it
+    uint32_t clusterRef;
+  } cases[] = {
+      {cluster, 0x20000, "Window", "Window", kvPropFrm_ClusterRef},
+      {cluster, 0x80000, "Lamp", "Lamp", kvPropPDU_ClusterRef},
+      {frame, 0x30000, "Lock", "Door.Lock", 0x05030034},
+      {frame, 0x40000, "Open", "Door.Open", 0x05040006},
+      {cluster, 0x50000, "Bcm", "Bcm", kvPropECU_ClstRef},
+      {cluster, 0x60000, "Fast", "Fast", kvPropLINSched_ClstRef},
+      {schedule, 0x70000, "Slot", "Sched.Slot", 0x05070009},
+  };
+  for (const auto &c : cases) {
+    SCOPED_TRACE(c.inCluster);
+    ASSERT_EQ(kvdbCreateObject(c.parent, c.objectClass, c.name, &made), 0);
+    EXPECT_EQ(made >> 24, 0x80 | c.objectClass >> 16);
+    EXPECT_EQ(kvdbCreateObject(c.parent, c.objectClass, c.name, &made), kvsimErrObjectExists);
+    EXPECT_EQ(DbFind(c.parent, c.objectClass, c.name), made);
+    EXPECT_EQ(DbFind(cluster, c.objectClass, c.inCluster), made);
+    EXPECT_EQ(NameOf(made), c.inCluster);
+    EXPECT_EQ(DbRead<uint32_t>(made, c.clusterRef), cluster);
+    uint32_t owner = 0;
+    EXPECT_EQ(kvhdndbGetDatabaseRefFromObjRef(made, &owner), 0);
+    EXPECT_EQ(owner, database);
+    ASSERT_EQ(kvdbDeleteObject(made), 0);
+    EXPECT_EQ(kvdbFindObject(c.parent, c.objectClass, c.name, &owner), kvsimErrObjectNotFound);
+    EXPECT_EQ(kvdbGetPropertySize(made, kNameIds[c.objectClass >> 16], &owner), kvsimErrInvalidDatabase);
+  }
+  // A subframe holds the signals of its value; a schedule its entries. A LIN schedule has no
+  // place in a database file.
+  uint32_t subframe = 0, dynamic = 0, entry = 0, ignored = 0;
+  ASSERT_EQ(kvdbCreateObject(frame, 0x40000, "Sub", &subframe), 0);
+  ASSERT_EQ(kvdbCreateObject(subframe, 0x30000, "Dyn", &dynamic), 0);
+  EXPECT_EQ(DbRead<uint32_t>(dynamic, kvPropSig_MuxSubfrmRef), subframe);
+  ASSERT_EQ(kvdbCreateObject(schedule, 0x70000, "E", &entry), 0);
+  EXPECT_EQ(kvdbSaveDatabase(database, directory_.Sub("lin.dbc").c_str()), kvsimErrDatabaseWrite);
+  EXPECT_FALSE(std::filesystem::exists(directory_.Sub("lin.dbc")));
+  ASSERT_EQ(kvdbDeleteObject(subframe) + kvdbDeleteObject(schedule), 0);
+  EXPECT_EQ(kvdbGetPropertySize(dynamic, kvPropSig_Name, &ignored), kvsimErrInvalidDatabase);
+  EXPECT_EQ(kvdbGetPropertySize(entry, kvPropLINSchedEntry_Name, &ignored), kvsimErrInvalidDatabase);
+  // A reference's open is given back by one close of its handle.
+  ASSERT_EQ(kvhdndbOpenDatabaseByRef(frame), 0);
+  EXPECT_EQ(kvhdndbOpenDatabaseByRef(0x0FFFFFFF), kvsimErrInvalidDatabase);
+  EXPECT_EQ(kvdbCloseDatabase(frame, 0) + kvdbCloseDatabase(database, 0), 0);
+  EXPECT_EQ(kvsimLoadedDatabaseCount(), 0);
+}
+
+TEST_F(KvorDatabase, AliasesOutliveAResetInTheirFileAndDeploymentsAreListedPerTarget) {
+  directory_.WriteFile("radar.dbc", ReadWholeFile(DbcPath("mazda_radar.dbc")));
+  ASSERT_EQ(kvdbAddAlias64("Radar", directory_.Sub("radar.dbc").c_str(), 125000), 0);
+  kvsimReset();
+  EXPECT_EQ(DbRead<uint32_t>(DbCluster(OpenDatabase("Radar")), kvPropClst_BaudRate), 125000u);
+  const auto list = [](const char *target) {
+    uint32_t aliasesSize = 0, pathsSize = 0, count = 0;
+    const uint64_t at = reinterpret_cast<uintptr_t>(target);
+    EXPECT_EQ(kvdbGetDatabaseListSizes(at, &aliasesSize, &pathsSize), 0);
+    std::string aliases(aliasesSize, '?'), paths(pathsSize, '?');
+    const int32_t status =
+        kvdbGetDatabaseList(at, aliasesSize, aliases.data(), pathsSize, paths.data(), &count);
+    return std::to_string(status) + ":" + std::to_string(count) + ":" + aliases.c_str();
+  };
+  EXPECT_EQ(kvdbDeploy("10.0.0.2", "Radar", 0, nullptr), 0);
+  EXPECT_EQ(kvdbDeploy("10.0.0.2", "NoSuchAlias", 0, nullptr), kvsimErrDatabaseNotFound);
+  EXPECT_EQ(list("10.0.0.2"), "0:1:Radar");
+  EXPECT_EQ(list("10.0.0.3"), "0:0:");
+  kvsimChangeDatabaseList(2);
+  // A list that changed under its reader copies nothing.
+  for (int round = 0; round < 2; ++round) {
+    EXPECT_EQ(list(nullptr), std::to_string(kvErrDatabaseListChanged) + ":0:??????");
+  }
+  EXPECT_EQ(list(nullptr), "0:1:Radar");
+  EXPECT_EQ(kvdbUndeploy("10.0.0.2", "Radar"), 0);
+  EXPECT_EQ(list("10.0.0.2"), "0:0:");
+  ASSERT_EQ(kvdbRemoveAlias("Radar"), 0);
+  kvsimReset();
+  uint32_t database = 0;
+  EXPECT_EQ(kvdbOpenDatabase("Radar", &database), kvsimErrDatabaseNotFound);
+}
+
+TEST_F(KvorDatabase, AMergeCopiesTheClusterByItsModeAndPrefixOrNothing) {
+  const std::string source = kHead + kFrame + kSignal + "BO_ 200 G: 8 B\n";
+  const struct {
+    uint32_t mode;
+    const char *prefix;
+    std::string target;
+    int32_t status;
+    const char *frames;  // of the target afterwards, by name and identifier
+  } cases[] = {
+      {0, "", kHead + "BO_ 100 F: 2 A\n", 0, "F100/8,G200/8,"},
+      {1, "", kHead + "BO_ 100 F: 2 A\n", 0, "F100/2,G200/8,"},
+      {2, "", kHead + "BO_ 100 F: 2 A\n", kvsimErrObjectExists, "F100/2,"},
+      {0, "", kHead + "BO_ 200 H: 2 A\n", kvsimErrObjectExists, "H200/2,"},
+      {2, "Src_", kHead + "BO_ 300 F: 2 A\n", 0, "F300/2,Src_F100/8,Src_G200/8,"},
+  };
+  for (const auto &c : cases) {
+    SCOPED_TRACE(c.mode);
+    uint32_t from = 0, into = 0, percent = 0;
+    ASSERT_EQ(OpenText(source, &from) + OpenText(c.target, &into), 0);
+    EXPECT_EQ(kvdbMerge(DbCluster(into), DbCluster(from), c.mode, c.prefix, 1, &percent), c.status);
+    std::string frames;
+    for (const uint32_t frame : DbHandles(DbCluster(into), kvPropClst_FrmRefs)) {
+      frames += NameOf(frame) + std::to_string(DbRead<uint32_t>(frame, kvPropFrm_ID)) + "/" +
+                std::to_string(DbRead<uint32_t>(frame, kvPropFrm_PayloadLen)) + ",";
+    }
+    EXPECT_EQ(frames, c.frames);
+    if (c.status == 0) EXPECT_EQ(percent, 100u);
+  }
+}
+
+TEST_F(KvorDatabase, AttributesAreGivenByValueDefaultEnumerationAndName) {
+  uint32_t database = 0;
+  ASSERT_EQ(OpenText(kHead + kFrame + kSignal +
+                         "BA_DEF_ BU_ \"Role\" ENUM \"Gateway\",\"Sensor\";\n"
+                         "BA_DEF_ SG_ \"Res\" FLOAT 0 1;\nBA_DEF_ \"Owner\" STRING;\n"
+                         "BA_DEF_DEF_ \"Role\" 1;\nBA_DEF_DEF_ \"Res\" 0.5;\n"
+                         "BA_ \"Role\" BU_ A 0;\nBA_ \"Owner\" \"me\";\n",
+                     &database),
+            0);
+  const uint32_t cluster = DbCluster(database);
+  const uint32_t a = DbFind(cluster, 0x50000, "A"), b = DbFind(cluster, 0x50000, "B");
+  const uint32_t s = DbFind(cluster, 0x30000, "S");
+  const struct {
+    uint32_t object, mode;
+    const char *name, *text;
+    uint32_t isDefault;
+  } cases[] = {
+      {a, 0, "Role", "Gateway", 0},       {b, 0, "Role", "Sensor", 1},
+      {s, 0, "Res", "0.5", 1},            {database, 0, "Owner", "me", 0},
+      {a, 1, "Role", "Gateway,Sensor", 7}, {a, 2, nullptr, "Role", 7},
+      {s, 1, "Res", "<none>", 7},         {s, 0, "Role", "<none>", 7},
+  };
+  for (const auto &c : cases) {
+    SCOPED_TRACE(c.text);
+    uint32_t isDefault = 7;
+    EXPECT_EQ(DbcAttribute(c.object, c.mode, c.name, &isDefault), c.text);
+    EXPECT_EQ(isDefault, c.isDefault);
+  }
 }
 
 }  // namespace
