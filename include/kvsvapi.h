@@ -785,7 +785,7 @@ KVSV_EXPORT kvsvStatus kvsvdbGetDatabaseList(uint64_t target, SvHandle *aliases,
  * (made if null). `mode` 0 the value of attribute `name` (`*isDefault` 1 when only its
  * definition's default applies), 1 the texts of an enumeration attribute, 2 the names of the
  * attributes of the object's class, comma-separated. A failed read leaves the string's count as it
- * was. 0xBFF63015 for a null `value`; 0xBFF63010 out of memory. */
+ * was, or 0 if the string had to shrink below it. 0xBFF63015 for a null `value`; 0xBFF63010 out of memory. */
 KVSV_EXPORT kvsvStatus kvsvdbGetDBCAttribute(uint32_t object, uint32_t mode, const char *name,
                                              SvHandle *value, uint32_t *isDefault);
 
@@ -873,6 +873,20 @@ KVSV_EXPORT kvsvStatus kvsvdbCreateObject(uint32_t parent, uint32_t objectClass,
  * delete's status. An object with more than 100 holders is logged as an internal error and
  * deleted all the same. */
 KVSV_EXPORT kvsvStatus kvsvdbDeleteObject(uint32_t handle, kvsvRefnum reference);
+
+/* ---- Database properties -------------------------------------------------------------------
+ * Properties of database objects by their identifiers. A failure other than 0 stores a new
+ * string naming the property through `info` (may be null); the host owns what it held before. */
+
+/* The object (Ref), or the objects (Ref1D), that property `id` of `object` refers to, as the
+ * reference texts by which a host opens them: the name, a line feed and "database.cluster" (the
+ * database alone for the cluster named "Cluster"). Ref replaces the string `*value`, Ref1D the
+ * array of strings `*value` with its strings. A text property, or one that refers to nothing,
+ * gives the internal error. 0xBFF63015 for a null `value`. */
+KVSV_EXPORT kvsvStatus kvsvdbGetPropRef(uint32_t object, uint32_t id, SvHandle *value,
+                                        SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvdbGetPropRef1D(uint32_t object, uint32_t id, SvHandle *value,
+                                          SvHandle *info);
 
 #ifdef __cplusplus
 }

@@ -381,9 +381,12 @@ Status DatabaseRegistry::GetListSizes(uint64_t target, uint32_t *aliasesSize, ui
   if (aliasesSize == nullptr || pathsSize == nullptr) return kvsimErrNullPointer;
   std::lock_guard<std::mutex> lock(mutex_);
   std::string aliases, paths;
-  ListOf(target)->Lists(&aliases, &paths);
-  *aliasesSize = static_cast<uint32_t>(aliases.size() + 1);
-  *pathsSize = static_cast<uint32_t>(paths.size() + 1);
+  // No alias at all is no list, not an empty text.
+  const DatabaseAliases *list = ListOf(target);
+  list->Lists(&aliases, &paths);
+  const bool none = list->Count() == 0;
+  *aliasesSize = none ? 0 : static_cast<uint32_t>(aliases.size() + 1);
+  *pathsSize = none ? 0 : static_cast<uint32_t>(paths.size() + 1);
   return 0;
 }
 

@@ -82,6 +82,13 @@ void DisposeHandleArray(SvHandle *array) {
   DisposeHandle(array);
 }
 
+void KeepStringCountInBlock(SvHandle string) {
+  if (string == nullptr) return;
+  SvStr *text = static_cast<SvStr *>(*string);
+  const size_t room = svGetHandleSize(string) - sizeof text->cnt;
+  if (text->cnt < 0 || static_cast<size_t>(text->cnt) > room) text->cnt = 0;
+}
+
 Status StringFromSvStr(std::string &target, const SvStr *source) {
   if (source == nullptr) return kvErrNullArgument;
   // A negative count is as empty as a zero one.

@@ -40,6 +40,11 @@ void *GrowHandleArray(SvHandle *array, uint32_t extra, uint32_t *capacityOut);
 // Disposes each element of an array of handles, then the array.
 void DisposeHandleArray(SvHandle *array);
 
+// A failed read keeps the host's count, unless the resize before it left the block too small to
+// hold that many bytes: then the string is emptied rather than left to be read past its end. A
+// null handle is left alone.
+void KeepStringCountInBlock(SvHandle string);
+
 // Copies a counted string. Null `source` gives 0xBFF63015; out of memory 0xBFF63010.
 Status StringFromSvStr(std::string &target, const SvStr *source);
 

@@ -28,7 +28,10 @@ extern "C" KVSV_EXPORT kvsvStatus kvsvdbGetDBCAttribute(uint32_t object, uint32_
   SvStr *text = static_cast<SvStr *>(**value);
   status = kvdbGetDBCAttribute(object, mode, name, size,
                                reinterpret_cast<char *>(text) + kHostCountBytes, isDefault);
-  if (status < 0) return status;
+  if (status < 0) {
+    KeepStringCountInBlock(*value);
+    return status;
+  }
   // The driver's size counts the NUL, which the host's count does not.
   text->cnt = size == 0 ? 0 : static_cast<int32_t>(size - 1);
   return status;

@@ -23,15 +23,6 @@ void CountText(SvHandle string) {
   static_cast<SvStr *>(*string)->cnt = static_cast<int32_t>(std::strlen(TextOf(string)));
 }
 
-// A failed read keeps the host's count, unless the resize before it left the block too small to
-// hold that many bytes: then the string is emptied rather than left to be read past its end.
-void KeepCountInBlock(SvHandle string) {
-  if (string == nullptr) return;
-  SvStr *text = static_cast<SvStr *>(*string);
-  const size_t room = svGetHandleSize(string) - kHostCountBytes;
-  if (text->cnt < 0 || static_cast<size_t>(text->cnt) > room) text->cnt = 0;
-}
-
 // The host sees "database.cluster", read as two properties into one handle.
 Status ReadClusterName(uint32_t handle, SvHandle *value) {
   if (value == nullptr) return kvErrNullArgument;
@@ -47,7 +38,7 @@ Status ReadClusterName(uint32_t handle, SvHandle *value) {
   char *text = TextOf(*value);
   status = tSessionPropertyCalls::Get(handle, kvPropSession_DatabaseName, sum, text);
   if (status < 0) {
-    KeepCountInBlock(*value);
+    KeepStringCountInBlock(*value);
     return status;
   }
   const size_t length = std::strlen(text);
@@ -57,7 +48,7 @@ Status ReadClusterName(uint32_t handle, SvHandle *value) {
   if (status >= 0) {
     CountText(*value);
   } else {
-    KeepCountInBlock(*value);
+    KeepStringCountInBlock(*value);
   }
   return status;
 }
@@ -66,7 +57,7 @@ Status ReadString(uint32_t handle, uint32_t id, SvHandle *value) {
   if (id == kvPropSession_ClusterName) return ReadClusterName(handle, value);
   // The handle has room behind the driver's bytes: a text without its NUL ends there.
   const auto countText = [value](Status status, uint32_t size) {
-    if (status < 0) return KeepCountInBlock(*value);
+    if (status < 0) return KeepStringCountInBlock(*value);
     TextOf(*value)[size] = '\0';
     CountText(*value);
   };
