@@ -76,6 +76,9 @@ void DatabaseRegistry::DropHandles(const std::function<bool(const tEntry &)> &do
 
 void DatabaseRegistry::Unload(tLoaded *loaded) {
   DropHandles([&](const tEntry &entry) { return entry.loaded == loaded; });
+  for (auto it = deleted_.begin(); it != deleted_.end();) {
+    it = it->second == loaded ? deleted_.erase(it) : std::next(it);
+  }
   loaded_.erase(loaded->key);
 }
 
@@ -144,8 +147,9 @@ Status DatabaseRegistry::Open(const char *name, uint32_t *handle) {
 Status DatabaseRegistry::Close(uint32_t handle, uint32_t closeAll) {
   std::lock_guard<std::mutex> lock(mutex_);
   tEntry *entry = Resolve(handle);
-  if (entry == nullptr) return kvsimErrInvalidDatabase;
-  tLoaded *loaded = entry->loaded;
+  const auto deleted = deleted_.find(handle);
+  if (entry == nullptr && deleted == deleted_.end()) return kvsimErrInvalidDatabase;
+  tLoaded *loaded = entry != nullptr ? entry->loaded : deleted->second;
   if (closeAll != 0 || --loaded->opens == 0) Unload(loaded);
   return 0;
 }
@@ -201,7 +205,11 @@ Status DatabaseRegistry::DeleteObject(uint32_t object) {
   if (entry == nullptr) return kvsimErrInvalidDatabase;
   std::set<const void *> gone;
   const Status status = nKvorSim::DeleteObject(entry->ref, &gone);
-  if (status == 0) DropHandles([&](const tEntry &e) { return IsWithin(e.ref, gone); });
+  if (status == 0) {
+    tLoaded *loaded = entry->loaded;
+    deleted_[object] = loaded;
+    DropHandles([&](const tEntry &e) { return IsWithin(e.ref, gone); });
+  }
   return status;
 }
 
@@ -401,6 +409,9 @@ Status DatabaseRegistry::GetList(uint64_t target, uint32_t aliasesSize, char *al
     --listChanges_;
     return kvErrDatabaseListChanged;
   }
+  *count = 0;
+  // An empty list fits the sizes 0 that its size call gave: nothing to copy.
+  if (list->Count() == 0) return 0;
   if (aliasList.size() >= aliasesSize || pathList.size() >= pathsSize) {
     return kvErrDatabaseListChanged;
   }
@@ -482,6 +493,7 @@ size_t DatabaseRegistry::LoadedCount() const {
 void DatabaseRegistry::Reset() {
   std::lock_guard<std::mutex> lock(mutex_);
   handles_.clear();
+  deleted_.clear();
   byObject_.clear();
   errorObjects_.clear();
   loaded_.clear();

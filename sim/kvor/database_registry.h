@@ -133,6 +133,8 @@ class DatabaseRegistry {
   mutable std::mutex mutex_;
   std::map<std::string, std::unique_ptr<tLoaded>> loaded_;  // by key
   std::unordered_map<uint32_t, tEntry> handles_;
+  // Handles of deleted objects: their close still gives back an open of their database.
+  std::unordered_map<uint32_t, tLoaded *> deleted_;
   std::map<std::pair<uint32_t, const void *>, uint32_t> byObject_;  // class and object
   uint32_t lastNumber_ = 0;
   std::unordered_map<uint32_t, Status> errorObjects_;

@@ -232,7 +232,8 @@
  *                     start bit 0 with update bit 0xFFFFFFFF (none). Subframes, LIN schedules and
  *                     their entries answer their names, cluster references and the references
  *                     between them only.
- *   kvdbCloseDatabase Answers kvsimErrInvalidDatabase for a handle of no loaded database.
+ *   kvdbCloseDatabase Answers kvsimErrInvalidDatabase for a handle of no loaded database; the handle
+ *                     of an object deleted from one still gives back one open of it.
  *   Error handles     kvBlink and kvdbCloseDatabase also answer an error session, given in place
  *                     of their object, with its status, as the session calls do.
  *   kvhdndbCreateErrorObject

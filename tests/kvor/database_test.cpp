@@ -481,7 +481,9 @@ TEST_F(KvorDatabase, AMergeCopiesTheClusterByItsModeAndPrefixOrNothing) {
                 std::to_string(DbRead<uint32_t>(frame, kvPropFrm_PayloadLen)) + ",";
     }
     EXPECT_EQ(frames, c.frames);
-    if (c.status == 0) EXPECT_EQ(percent, 100u);
+    if (c.status == 0) {
+      EXPECT_EQ(percent, 100u);
+    }
   }
 }
 
