@@ -3,6 +3,17 @@
 #include <cstdlib>
 #include <cstring>
 #include <new>
+#include <type_traits>
+
+#if defined(__has_include)
+#if __has_include(<sanitizer/asan_interface.h>)
+#include <sanitizer/asan_interface.h>
+#endif
+#endif
+#ifndef ASAN_POISON_MEMORY_REGION
+#define ASAN_POISON_MEMORY_REGION(address, size) ((void)(address), (void)(size))
+#define ASAN_UNPOISON_MEMORY_REGION(address, size) ((void)(address), (void)(size))
+#endif
 
 #include "fatal.h"
 #include "fault_plan.h"
@@ -23,6 +34,11 @@ void FreeBlock(void *block, size_t size) {
   std::free(block);
 }
 
+// The first slot to try for the slab at `base`: Fibonacci hashing of its number, 12 bits.
+size_t FirstSlot(uintptr_t base, size_t slabBytes) {
+  return static_cast<size_t>(((base / slabBytes) * 0x9E3779B97F4A7C15u) >> 52);
+}
+
 }  // namespace
 
 HandleStore &HandleStore::Instance() {
@@ -31,70 +47,124 @@ HandleStore &HandleStore::Instance() {
   return *store;
 }
 
-HandleStore::Entry &HandleStore::Find(SvHandle handle, const char *operation) {
-  auto it = live_.find(handle);
-  if (it == live_.end())
+HandleStore::Master *HandleStore::Lookup(SvHandle handle) const {
+  // A handle is the address of a record's first member, so the two convert into each other.
+  static_assert(std::is_standard_layout<Master>::value, "a handle must be its record's address");
+  static_assert(kSlabBytes % sizeof(Master) == 0, "records fill their slab exactly");
+  const uintptr_t address = reinterpret_cast<uintptr_t>(handle);
+  const uintptr_t base = address & ~uintptr_t{kSlabBytes - 1};
+  if (base == 0 || (address - base) % sizeof(Master) != 0) return nullptr;
+  // The table is never more than half full, so the probe ends at an empty slot.
+  for (size_t slot = FirstSlot(base, kSlabBytes);; slot = (slot + 1) % kSlabSlots) {
+    const uintptr_t slab = slabs_[slot].load(std::memory_order_acquire);
+    if (slab == base) return reinterpret_cast<Master *>(address);
+    if (slab == 0) return nullptr;
+  }
+}
+
+HandleStore::Master &HandleStore::Find(SvHandle handle, const char *operation) const {
+  Master *master = Lookup(handle);
+  if (master == nullptr || master->block.load(std::memory_order_acquire) == nullptr)
     Fatal(operation, handle, "not a live handle (never made, or already disposed of)");
-  if (*handle != it->second.block)
+  if (master->pointer != master->block.load(std::memory_order_relaxed))
     Fatal(operation, handle, "master pointer overwritten: it no longer holds the handle's block");
-  return it->second;
+  return *master;
+}
+
+bool HandleStore::AddSlab() {
+  static_assert(kSlabSlots == size_t{1} << 12, "FirstSlot yields 12 bits");
+  if (slabCount_ == kMaxSlabs) return false;
+  void *slab = std::aligned_alloc(kSlabBytes, kSlabBytes);
+  if (slab == nullptr) return false;
+  auto first = static_cast<Master *>(slab);
+  const size_t count = kSlabBytes / sizeof(Master);
+  for (size_t i = 0; i < count; ++i) new (first + i) Master{};
+  const uintptr_t base = reinterpret_cast<uintptr_t>(slab);
+  size_t slot = FirstSlot(base, kSlabBytes);
+  while (slabs_[slot].load(std::memory_order_relaxed) != 0) slot = (slot + 1) % kSlabSlots;
+  slabs_[slot].store(base, std::memory_order_release);
+  ++slabCount_;
+  fresh_ = first;
+  freshEnd_ = first + count;
+  return true;
+}
+
+HandleStore::Master *HandleStore::Take() {
+  const bool fresh = freeCount_ <= kQuarantine && (fresh_ != freshEnd_ || AddSlab());
+  if (fresh) return fresh_++;
+  // Past the quarantine, or out of slabs: the oldest freed record serves again.
+  Master *master = freeHead_;
+  if (master == nullptr) return nullptr;
+  freeHead_ = master->next;
+  if (freeHead_ == nullptr) freeTail_ = nullptr;
+  --freeCount_;
+  return master;
 }
 
 SvHandle HandleStore::Create(size_t size) {
   if (FaultPlan::Instance().AllocationFails()) return nullptr;
   void *block = AllocateBlock(size);
   if (block == nullptr) return nullptr;
-  auto handle = static_cast<SvHandle>(std::malloc(sizeof(void *)));
-  if (handle == nullptr) {
-    std::free(block);
-    return nullptr;
-  }
   std::memset(block, 0, size);
-  *handle = block;
   std::lock_guard<std::mutex> lock(mutex_);
-  try {
-    live_.emplace(handle, Entry{block, size});
-  } catch (const std::bad_alloc &) {
+  Master *master = Take();
+  if (master == nullptr) {
     std::free(block);
-    std::free(handle);
     return nullptr;
   }
+  ASAN_UNPOISON_MEMORY_REGION(&master->pointer, sizeof master->pointer);
+  master->pointer = block;
+  master->next = nullptr;
+  master->size.store(size, std::memory_order_relaxed);
+  master->block.store(block, std::memory_order_release);
+  ++live_;
   ++allocations_;
-  return handle;
+  return &master->pointer;
 }
 
 int32_t HandleStore::Resize(SvHandle handle, size_t size, const char *operation) {
   std::lock_guard<std::mutex> lock(mutex_);
-  Entry &entry = Find(handle, operation);
+  Master &master = Find(handle, operation);
   if (FaultPlan::Instance().ResizeFails()) return resizeError_;
+  void *const old = master.block.load(std::memory_order_relaxed);
+  const size_t oldSize = master.size.load(std::memory_order_relaxed);
   void *block = nullptr;
   if (moveOnResize_) {
     block = AllocateBlock(size);
     if (block == nullptr) return resizeError_;
-    std::memcpy(block, entry.block, entry.size < size ? entry.size : size);
-    FreeBlock(entry.block, entry.size);
+    std::memcpy(block, old, oldSize < size ? oldSize : size);
+    FreeBlock(old, oldSize);
   } else {
-    block = std::realloc(entry.block, size == 0 ? 1 : size);
+    block = std::realloc(old, size == 0 ? 1 : size);
     if (block == nullptr) return resizeError_;
   }
-  if (size > entry.size) std::memset(static_cast<char *>(block) + entry.size, 0, size - entry.size);
-  *handle = block;
-  entry = Entry{block, size};
+  if (size > oldSize) std::memset(static_cast<char *>(block) + oldSize, 0, size - oldSize);
+  master.pointer = block;
+  master.size.store(size, std::memory_order_relaxed);
+  master.block.store(block, std::memory_order_release);
   ++resizes_;
   return 0;
 }
 
 size_t HandleStore::Size(SvHandle handle, const char *operation) {
-  std::lock_guard<std::mutex> lock(mutex_);
-  return Find(handle, operation).size;
+  return Find(handle, operation).size.load(std::memory_order_relaxed);
 }
 
 void HandleStore::Dispose(SvHandle handle, const char *operation) {
   std::lock_guard<std::mutex> lock(mutex_);
-  const Entry entry = Find(handle, operation);
-  live_.erase(handle);
-  FreeBlock(entry.block, entry.size);
-  std::free(handle);
+  Master &master = Find(handle, operation);
+  void *const block = master.block.load(std::memory_order_relaxed);
+  master.block.store(nullptr, std::memory_order_release);
+  FreeBlock(block, master.size.load(std::memory_order_relaxed));
+  // A program that reads its block through a disposed handle is caught by address checking,
+  // and finds no block without it.
+  master.pointer = nullptr;
+  ASAN_POISON_MEMORY_REGION(&master.pointer, sizeof master.pointer);
+  master.next = nullptr;
+  (freeTail_ != nullptr ? freeTail_->next : freeHead_) = &master;
+  freeTail_ = &master;
+  ++freeCount_;
+  --live_;
   ++frees_;
 }
 
@@ -125,7 +195,7 @@ uint64_t HandleStore::Frees() {
 
 uint64_t HandleStore::Live() {
   std::lock_guard<std::mutex> lock(mutex_);
-  return live_.size();
+  return live_;
 }
 
 void HandleStore::ResetCounters() {

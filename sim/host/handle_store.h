@@ -1,13 +1,14 @@
-// The host's memory manager: relocatable blocks reached through master pointers. Every live handle
-// is in a table with its size, so that a handle the manager did not make, or made and freed, is
-// caught at its first use instead of corrupting the heap.
+// The host's memory manager: relocatable blocks reached through master pointers. A handle is the
+// address of a master record that the manager keeps for as long as the process runs, so that a
+// handle it did not make, or made and freed, is caught at its first use instead of corrupting the
+// heap, and so that asking a handle's size takes no lock, as it takes none in a real host.
 #ifndef SVHOST_HANDLE_STORE_H
 #define SVHOST_HANDLE_STORE_H
 
+#include <atomic>
 #include <cstddef>
 #include <cstdint>
 #include <mutex>
-#include <unordered_map>
 
 #include "kvsvapi.h"
 #include "svsim.h"
@@ -23,7 +24,8 @@ class HandleStore {
   // 0, or the resize error code with the block left as it was. Growth is zeroed. `operation`
   // names the caller in the message of a fatal stop, here and below.
   int32_t Resize(SvHandle handle, size_t size, const char *operation);
-  // Size of a live handle. Aborts on a handle that is not live.
+  // Size of a live handle. Aborts on a handle that is not live. Takes no lock: threads that use
+  // different handles never wait for each other here.
   size_t Size(SvHandle handle, const char *operation);
   void Dispose(SvHandle handle, const char *operation);
 
@@ -39,16 +41,42 @@ class HandleStore {
   void Reset();
 
  private:
-  struct Entry {
-    void *block;
-    size_t size;
+  // What a handle points at. `pointer` comes first: the handle is its address, and a program
+  // reads its block through it. `block` is the store's own copy, null while the record is free;
+  // `next` links free records and is touched only under the mutex.
+  struct alignas(32) Master {
+    void *pointer;
+    std::atomic<void *> block;
+    std::atomic<size_t> size;
+    Master *next;
   };
 
-  // Aborts unless `handle` is live and its master pointer still holds the block it was given.
-  Entry &Find(SvHandle handle, const char *operation);
+  // Records come in slabs aligned to their size, so that the slab of any address is found by
+  // masking it; slab addresses sit in an open-addressed table that is only ever added to.
+  static constexpr size_t kSlabBytes = size_t{1} << 16;
+  static constexpr size_t kSlabSlots = 4096;
+  static constexpr size_t kMaxSlabs = kSlabSlots / 2;
+  // A freed record is handed out again only after this many others were freed, so that a stale
+  // handle keeps failing for a while instead of quietly reaching someone else's block.
+  static constexpr size_t kQuarantine = 1024;
 
+  // The record at `handle`, or null when `handle` is not the address of one.
+  Master *Lookup(SvHandle handle) const;
+  // Aborts unless `handle` is live and its master pointer still holds the block it was given.
+  Master &Find(SvHandle handle, const char *operation) const;
+  // A free record, or null when no memory is left for one. Under the mutex.
+  Master *Take();
+  bool AddSlab();
+
+  std::atomic<uintptr_t> slabs_[kSlabSlots] = {};
   std::mutex mutex_;
-  std::unordered_map<SvHandle, Entry> live_;
+  size_t slabCount_ = 0;
+  Master *fresh_ = nullptr;  // the rest of the newest slab, never handed out yet
+  Master *freshEnd_ = nullptr;
+  Master *freeHead_ = nullptr;
+  Master *freeTail_ = nullptr;
+  size_t freeCount_ = 0;
+  uint64_t live_ = 0;
   bool moveOnResize_ = false;
   int32_t resizeError_ = SVSIM_ERR_MEMORY;
   uint64_t allocations_ = 0;

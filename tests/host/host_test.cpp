@@ -1,6 +1,7 @@
 // What the library's tests lean on the host stand-in for: the mode in which every resize moves a
 // block, so that a stale block pointer shows; exact counts of handle operations and live paths;
-// faults that hit exactly the operation asked for; and a stop of the process on dead host data.
+// faults that hit exactly the operation asked for; and a stop of the process on dead host data or
+// a handle the host never made.
 #include <gtest/gtest.h>
 
 #include <cstring>
@@ -93,6 +94,12 @@ TEST_F(HostDeathTest, DeadHostDataStopsTheProcessWithTheOperationNamed) {
   GTEST_FLAG_SET(death_test_style, "threadsafe");
   EXPECT_DEATH(svDisposeHandle(Broken(false)), "svDisposeHandle.*not a live handle");
   EXPECT_DEATH(svGetHandleSize(Broken(true)), "master pointer overwritten");
+  void *local = nullptr;
+  EXPECT_DEATH(svGetHandleSize(&local), "svGetHandleSize.*not a live handle");
+  // Inside a live handle's master record, but not its start.
+  EXPECT_DEATH(svGetHandleSize(reinterpret_cast<SvHandle>(reinterpret_cast<char *>(
+                   svNewHandleClr(8)) + sizeof(void *))),
+               "svGetHandleSize.*not a live handle");
 }
 
 }  // namespace
