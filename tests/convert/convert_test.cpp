@@ -224,15 +224,26 @@ TEST_F(ConvertTest, TheFormTagAndTheSizesSeenDecideWhetherTheCacheHolds) {
 TEST_F(ConvertTest, AHostThatShrinksOrDropsItsArraysGetsThemBuiltAgain) {
   cHostFrames out;
   const uint32_t session = SteadyTesla(out);
+  const std::vector<tFrameFields> expected = out.All();
   SvHandle in = Keep(ValueArray(kTeslaValues));
-  for (SvHandle payload : out.Payloads()) ASSERT_EQ(svSetHandleSizeClr(payload, 9), 0);
-  for (const bool drop : {false, true}) {
-    SCOPED_TRACE(drop ? "no arrays" : "payload handles too small for the limit");
-    if (drop) out.Dispose();
+  const struct {
+    const char *what;
+    size_t first, size;  // payload handles from `first` on are cut to `size` bytes, if not 0
+    int reads;           // of the frame count, 1 when the arrays are built again
+  } cases[] = {{"the last payload handle too small for its 8 bytes, the first as large as ever",
+                2, 5, 0},
+               {"payload handles too small for the limit", 0, 9, 1},
+               {"no arrays", 0, 0, 1}};
+  for (const auto &c : cases) {
+    SCOPED_TRACE(c.what);
+    const std::vector<SvHandle> payloads = out.Payloads();
+    for (size_t i = c.first; i < payloads.size() && c.size != 0; ++i)
+      ASSERT_EQ(svSetHandleSizeClr(payloads[i], c.size), 0);
+    if (c.size == 0) out.Dispose();
     kvsimLogClear();
     ASSERT_EQ(kvsvConvertSignalSinglePointToFrameCAN(session, &in, &out.frames, &out.spares), 0);
-    EXPECT_EQ(kvsimCountPropertyReads(kvPropSession_NumFrames), 1);
-    ASSERT_EQ(Count(out.frames), 3);
+    EXPECT_EQ(kvsimCountPropertyReads(kvPropSession_NumFrames), c.reads);
+    EXPECT_EQ(out.All(), expected);
     for (SvHandle payload : out.Payloads()) EXPECT_EQ(svGetHandleSize(payload), 15u);
   }
 }
