@@ -3,6 +3,8 @@
 #             UndefinedBehaviorSanitizer, the concurrency tests under ThreadSanitizer, and each
 #             fuzz target for a fixed number of runs; prints its total time at the end
 # make bench  builds and runs the benchmarks (optimised build)
+# make stress runs the soak for STRESS_SECONDS under AddressSanitizer and UndefinedBehaviorSanitizer,
+#             then under ThreadSanitizer; fails if either run fails
 
 JOBS ?= $(shell nproc)
 DEPS := libboost-dev pkg-config libgtest-dev libgmock-dev libbenchmark-dev cmake ninja-build g++ binutils \
@@ -12,7 +14,8 @@ CMAKE_FLAGS := -G Ninja -DKVSV_WERROR=ON
 SANITIZER_FLAGS := $(CMAKE_FLAGS) -DCMAKE_BUILD_TYPE=Debug -DCMAKE_C_FLAGS_DEBUG=-g1 \
         -DCMAKE_CXX_FLAGS_DEBUG=-g1 -DKVSV_BUILD_DEMO=OFF
 
-.PHONY: all deps build demo test test-asan test-tsan test-fuzz bench clean
+.PHONY: all deps build demo test test-asan test-tsan test-fuzz bench stress stress-asan stress-tsan \
+        clean
 
 all: build
 
@@ -68,5 +71,26 @@ bench: deps
 	cmake --build build-bench -j $(JOBS)
 	./build-bench/bench/kvsvbench
 
+STRESS_SECONDS ?= 60
+
+# Trees of their own, so that a soak never builds into the trees of make test while it runs.
+stress-asan: deps
+	cmake -S . -B build-stress-asan $(SANITIZER_FLAGS) -DKVSV_SANITIZE=address,undefined
+	cmake --build build-stress-asan -j $(JOBS) --target kvsv_soak
+	ASAN_OPTIONS=detect_leaks=1:abort_on_error=1 UBSAN_OPTIONS=print_stacktrace=1 \
+	  ./build-stress-asan/stress/kvsv_soak $(STRESS_SECONDS)
+
+stress-tsan: deps
+	cmake -S . -B build-stress-tsan $(SANITIZER_FLAGS) -DKVSV_SANITIZE=thread
+	cmake --build build-stress-tsan -j $(JOBS) --target kvsv_soak
+	TSAN_OPTIONS=halt_on_error=1 ./build-stress-tsan/stress/kvsv_soak $(STRESS_SECONDS)
+
+# Both runs happen even when the first fails.
+stress: deps
+	@status=0; \
+	$(MAKE) --no-print-directory stress-asan || status=1; \
+	$(MAKE) --no-print-directory stress-tsan || status=1; \
+	exit $$status
+
 clean:
-	rm -rf build build-asan build-tsan build-bench build-fuzz
+	rm -rf build build-asan build-tsan build-bench build-fuzz build-stress-asan build-stress-tsan
