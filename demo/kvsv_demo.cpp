@@ -6,11 +6,13 @@
 #include <cinttypes>
 #include <cmath>
 #include <cstdio>
+#include <cstdlib>
 #include <cstring>
 #include <filesystem>
 #include <fstream>
 #include <string>
 
+#include "database_tour.h"
 #include "drive_scenario.h"
 #include "library_exports.h"
 #include "signals_svg.h"
@@ -88,6 +90,38 @@ void PrintCounts(const tDriveResult &r) {
               r.sessionsOpened, r.closesAtEnd, r.sessionsLeftOpen);
 }
 
+// A reference text shown on one line, its line feed as \n.
+std::string OneLine(const std::string &text) {
+  std::string shown = "\"";
+  for (char c : text) shown += c == '\n' ? std::string("\\n") : std::string(1, c);
+  return shown + "\"";
+}
+
+bool PrintDatabaseTour(const tDatabaseTour &t) {
+  std::printf("\nDatabase edited through the library:\n");
+  if (t.status < 0) {
+    std::fprintf(stderr, "%s failed: status 0x%08" PRIX32 "\n", t.failedCall.c_str(),
+                 static_cast<uint32_t>(t.status));
+    return false;
+  }
+  std::printf("  opened by alias \"tesla\"; found frame %s and signal %s\n",
+              OneLine(t.frameReference).c_str(), OneLine(t.signalReference).c_str());
+  std::printf("  the cluster's frames by reference: %zu, from %s to %s\n", t.clusterFrames.size(),
+              t.clusterFrames.empty() ? "-" : OneLine(t.clusterFrames.front()).c_str(),
+              t.clusterFrames.empty() ? "-" : OneLine(t.clusterFrames.back()).c_str());
+  std::printf("  created LIN schedule %s with one entry, then deleted it\n",
+              OneLine(t.scheduleReference).c_str());
+  std::printf("  added frame \"DemoFrame\", saved to %s, reloaded as \"tesla_edited\": %s\n",
+              t.savedPath.c_str(), t.addedFrameReloaded ? "frame found" : "frame MISSING");
+  std::printf("  databases known:");
+  for (size_t i = 0; i < t.aliases.size(); ++i) {
+    std::printf(" %s=%s", t.aliases[i].c_str(),
+                i < t.aliasFiles.size() ? t.aliasFiles[i].c_str() : "?");
+  }
+  std::printf("\n  databases open at the end: %" PRIu32 "\n", t.openDatabasesAtEnd);
+  return t.addedFrameReloaded && t.openDatabasesAtEnd == 0;
+}
+
 bool WritePicture(const tDriveResult &r, const std::string &directory) {
   std::vector<tPlotCurve> curves;
   for (size_t i = 0; i < r.waveforms.size() && i < 2; ++i) {
@@ -122,6 +156,10 @@ int main(int argc, char **argv) {
     }
   }
   options.directory = std::filesystem::absolute(outDirectory + "/app").string();
+  // The stand-in driver keeps its alias file beside the demonstration's output rather than in the
+  // user's configuration, unless told otherwise.
+  setenv("KVSIM_CONFIG_DIR",
+         std::filesystem::absolute(outDirectory + "/driver-config").string().c_str(), 0);
   std::filesystem::create_directories(options.directory);
 
   // The host loads the library with its symbols open to the process: the host finds the close of
@@ -152,5 +190,9 @@ int main(int argc, char **argv) {
   PrintFrames(result);
   PrintSignals(result);
   PrintCounts(result);
-  return WritePicture(result, outDirectory) ? 0 : 1;
+  const bool pictured = WritePicture(result, outDirectory);
+  const tDatabaseTour tour =
+      RunDatabaseTour(exports, KVSV_DEMO_DBC, std::filesystem::absolute(outDirectory).string(),
+                      "DAS_control", "DAS_setSpeed");
+  return PrintDatabaseTour(tour) && pictured ? 0 : 1;
 }

@@ -28,6 +28,16 @@ tLibraryExports ExportsOf(void *library, std::string &error) {
   Find(library, "kvsvReadFrameCAN", e.readFrameCAN, error);
   Find(library, "kvsvConvertSignalSinglePointToFrameCAN", e.convertSignalsToFrameCAN, error);
   Find(library, "kvsvConvertFrameCANToSignalSinglePoint", e.convertFrameCANToSignals, error);
+  Find(library, "kvsvdbAddAlias", e.dbAddAlias, error);
+  Find(library, "kvsvdbRemoveAlias", e.dbRemoveAlias, error);
+  Find(library, "kvsvdbManualOpen", e.dbManualOpen, error);
+  Find(library, "kvsvdbManualClose", e.dbManualClose, error);
+  Find(library, "kvsvdbGetPropRef1D", e.dbGetPropRef1D, error);
+  Find(library, "kvsvdbCreateObject", e.dbCreateObject, error);
+  Find(library, "kvsvdbDeleteObject", e.dbDeleteObject, error);
+  Find(library, "kvsvdbSave", e.dbSave, error);
+  Find(library, "kvsvdbGetDatabaseList", e.dbGetDatabaseList, error);
+  Find(library, "kvsvGetNumOpenDatabases", e.dbNumOpen, error);
   return e;
 }
 

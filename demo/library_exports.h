@@ -22,6 +22,16 @@ struct tLibraryExports {
   decltype(&kvsvReadFrameCAN) readFrameCAN = nullptr;
   decltype(&kvsvConvertSignalSinglePointToFrameCAN) convertSignalsToFrameCAN = nullptr;
   decltype(&kvsvConvertFrameCANToSignalSinglePoint) convertFrameCANToSignals = nullptr;
+  decltype(&kvsvdbAddAlias) dbAddAlias = nullptr;
+  decltype(&kvsvdbRemoveAlias) dbRemoveAlias = nullptr;
+  decltype(&kvsvdbManualOpen) dbManualOpen = nullptr;
+  decltype(&kvsvdbManualClose) dbManualClose = nullptr;
+  decltype(&kvsvdbGetPropRef1D) dbGetPropRef1D = nullptr;
+  decltype(&kvsvdbCreateObject) dbCreateObject = nullptr;
+  decltype(&kvsvdbDeleteObject) dbDeleteObject = nullptr;
+  decltype(&kvsvdbSave) dbSave = nullptr;
+  decltype(&kvsvdbGetDatabaseList) dbGetDatabaseList = nullptr;
+  decltype(&kvsvGetNumOpenDatabases) dbNumOpen = nullptr;
 };
 
 // The exports of the library this program was linked with.

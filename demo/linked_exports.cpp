@@ -17,6 +17,16 @@ tLibraryExports LinkedExports() {
   e.readFrameCAN = &kvsvReadFrameCAN;
   e.convertSignalsToFrameCAN = &kvsvConvertSignalSinglePointToFrameCAN;
   e.convertFrameCANToSignals = &kvsvConvertFrameCANToSignalSinglePoint;
+  e.dbAddAlias = &kvsvdbAddAlias;
+  e.dbRemoveAlias = &kvsvdbRemoveAlias;
+  e.dbManualOpen = &kvsvdbManualOpen;
+  e.dbManualClose = &kvsvdbManualClose;
+  e.dbGetPropRef1D = &kvsvdbGetPropRef1D;
+  e.dbCreateObject = &kvsvdbCreateObject;
+  e.dbDeleteObject = &kvsvdbDeleteObject;
+  e.dbSave = &kvsvdbSave;
+  e.dbGetDatabaseList = &kvsvdbGetDatabaseList;
+  e.dbNumOpen = &kvsvGetNumOpenDatabases;
   return e;
 }
 

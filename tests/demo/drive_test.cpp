@@ -14,11 +14,14 @@
 #include <tuple>
 #include <vector>
 
+#include "database_tour.h"
 #include "drive_scenario.h"
 #include "kvsim.h"
 #include "kvsvplatform.h"
 #include "signals_svg.h"
+#include "support/scoped_env.h"
 #include "support/temp_dir.h"
+#include "svsim.h"
 
 namespace {
 
@@ -220,6 +223,33 @@ TEST(Drive, PartnerInterfacesAndValuesOnWholeRawSteps) {
   EXPECT_DOUBLE_EQ(s.Tolerance(), 0.025);
   EXPECT_DOUBLE_EQ(s.ValueAt(s.FractionOf(0.0)), 0.0);
   EXPECT_EQ(std::make_pair(s.FractionOf(-100.0), s.FractionOf(1000.0)), std::make_pair(0.0, 1.0));
+}
+
+// The database tour of the demonstration on a real file: the cluster's frames by reference, the
+// texts the library builds for what it creates, the edit saved and reloaded, and nothing left
+// open or registered when the program's references end.
+TEST(DatabaseTour, EditsSavesAndReloadsThroughTheExportsAndLeavesNothingOpen) {
+  const kvsvtest::cTempDir directory;
+  const kvsvtest::cScopedEnv config("KVSIM_CONFIG_DIR", directory.Sub("config"));
+  kvsimReset();
+  const std::string dbc = KVSV_DBC_DIR "/tesla_can.dbc";
+  const tDatabaseTour t =
+      RunDatabaseTour(LinkedExports(), dbc, directory.Path(), "DAS_control", "DAS_setSpeed");
+  ASSERT_EQ(t.status, 0) << t.failedCall;
+
+  const std::string text = kvsvtest::ReadFile(dbc);
+  const std::regex frameLine(R"(\nBO_ \d+ (\w+) *:)");
+  std::vector<std::string> frames;
+  for (std::sregex_iterator it(text.begin(), text.end(), frameLine), end; it != end; ++it)
+    frames.push_back((*it)[1].str() + "\ntesla");
+  EXPECT_EQ(t.clusterFrames, frames);
+  EXPECT_EQ(t.scheduleReference, "DemoSchedule\ntesla");
+  EXPECT_TRUE(t.addedFrameReloaded);
+  EXPECT_NE(kvsvtest::ReadFile(t.savedPath).find(" DemoFrame"), std::string::npos);
+  EXPECT_EQ(t.aliases, (std::vector<std::string>{"tesla", "tesla_edited"}));
+  EXPECT_EQ(t.aliasFiles.size(), 2u);
+  EXPECT_EQ(std::make_tuple(t.openDatabasesAtEnd, kvsimLoadedDatabaseCount(), svsimRefCount()),
+            std::make_tuple(0u, 0, 0));
 }
 
 // The points of each polyline of `svg`.
