@@ -836,7 +836,7 @@ KVSV_EXPORT uint32_t kvsvGetNumOpenDatabases(void);
 /* The host's open of the object of class `objectClass` named by the host string *name:
  * *handleOut gets the object, or, when the open fails, an object that gives the failure at its
  * first use; the failure is also returned. A text opened already gives the same object, and the
- * first close ends it for all. `context` is not used. */
+ * first close ends it for all. `context` is not used. 0xBFF63015 for a null `handleOut`. */
 KVSV_EXPORT kvsvStatus kvsvdbAutoOpenDbObject(SvHandle *name, uint32_t objectClass,
                                               uint32_t *handleOut, uint64_t context);
 

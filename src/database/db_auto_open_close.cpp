@@ -20,6 +20,7 @@ bool HasText(const SvHandle *name) {
 extern "C" KVSV_EXPORT kvsvStatus kvsvdbAutoOpenDbObject(SvHandle *name, uint32_t objectClass,
                                                          uint32_t *handleOut,
                                                          uint64_t /*context*/) {
+  if (handleOut == nullptr) return kvErrNullArgument;
   *handleOut = 0;
   if (!HasText(name)) {
     kvhdndbCreateErrorObject(kvErrDbReferenceEmpty, handleOut);
