@@ -26,6 +26,9 @@ void Rename(tCluster *copy, const std::string &prefix) {
   for (tFrame &frame : copy->frames) {
     frame.name = prefix + frame.name;
     frame.transmitter = Prefixed(prefix, frame.transmitter);
+    if (frame.pdus) {
+      for (std::string &pdu : frame.pdus->pdus) pdu = prefix + pdu;
+    }
     for (tSignal &signal : frame.signals) {
       for (std::string &receiver : signal.receivers) receiver = Prefixed(prefix, receiver);
     }

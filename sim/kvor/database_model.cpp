@@ -1,5 +1,8 @@
 #include "database_model.h"
 
+#include <algorithm>
+#include <cstddef>
+
 namespace nKvorSim {
 
 bool IsIdentifier(std::string_view name) {
@@ -53,6 +56,57 @@ const tSignal *FindMultiplexer(const tFrame &frame) {
     if (signal.mux == MuxRole::kMultiplexer) return &signal;
   }
   return nullptr;
+}
+
+tPduMapping PduMappingOf(const tFrame &frame) {
+  if (frame.pdus) return *frame.pdus;
+  return tPduMapping{{frame.name}, {0}, {kNoUpdateBit}};
+}
+
+namespace {
+
+void Replace(std::vector<std::string> *names, const std::string &from, const std::string &to) {
+  for (std::string &name : *names) {
+    if (name == from) name = to;
+  }
+}
+
+}  // namespace
+
+void RenameFrameReferences(tCluster *cluster, const std::string &from, const std::string &to) {
+  for (tFrame &frame : cluster->frames) {
+    if (frame.pdus) Replace(&frame.pdus->pdus, from, to);
+  }
+  for (tLinSchedule &schedule : cluster->linSchedules) {
+    for (tLinScheduleEntry &entry : schedule.entries) Replace(&entry.frames, from, to);
+  }
+}
+
+void ForgetFrame(tCluster *cluster, const std::string &name) {
+  for (tFrame &frame : cluster->frames) {
+    if (!frame.pdus) continue;
+    // A PDU's start and update bits go with it.
+    tPduMapping &mapping = *frame.pdus;
+    for (size_t i = mapping.pdus.size(); i-- > 0;) {
+      if (mapping.pdus[i] != name) continue;
+      mapping.pdus.erase(mapping.pdus.begin() + static_cast<std::ptrdiff_t>(i));
+      if (i < mapping.startBits.size()) mapping.startBits.erase(mapping.startBits.begin() + static_cast<std::ptrdiff_t>(i));
+      if (i < mapping.updateBits.size()) mapping.updateBits.erase(mapping.updateBits.begin() + static_cast<std::ptrdiff_t>(i));
+    }
+  }
+  for (tLinSchedule &schedule : cluster->linSchedules) {
+    for (tLinScheduleEntry &entry : schedule.entries) {
+      entry.frames.erase(std::remove(entry.frames.begin(), entry.frames.end(), name), entry.frames.end());
+    }
+  }
+}
+
+void RenameScheduleReferences(tCluster *cluster, const std::string &from, const std::string &to) {
+  for (tLinSchedule &schedule : cluster->linSchedules) {
+    for (tLinScheduleEntry &entry : schedule.entries) {
+      if (entry.collisionSchedule == from) entry.collisionSchedule = to;
+    }
+  }
 }
 
 std::string SubframeName(uint32_t muxValue) { return "m" + std::to_string(muxValue); }

@@ -90,6 +90,16 @@ struct tSubframe {
   uint32_t muxValue = 0;
 };
 
+// The PDUs that a frame carries, by name in its cluster, each with the bit of the frame where it
+// starts and the bit that tells whether it was updated (kNoUpdateBit: none). The three lists are
+// set one at a time, so they may differ in length for a while.
+constexpr uint32_t kNoUpdateBit = 0xFFFFFFFFu;
+struct tPduMapping {
+  std::vector<std::string> pdus;
+  std::vector<uint32_t> startBits;
+  std::vector<uint32_t> updateBits;
+};
+
 struct tFrame {
   std::string name;
   uint32_t id = 0;
@@ -104,22 +114,47 @@ struct tFrame {
   std::string comment;
   std::list<tSignal> signals;
   std::list<tSubframe> subframes;
+  // None while the frame carries its own PDU alone, at bit 0 with no update bit.
+  std::optional<tPduMapping> pdus;
   tAttributeValues attributes;
 };
+
+// The PDUs of the frame, its own if none were set.
+tPduMapping PduMappingOf(const tFrame &frame);
+
+// Values of kvPropECU_J1939PreferredAddress: the address that claims none.
+constexpr uint32_t kJ1939NullAddress = 254;
 
 struct tEcu {
   std::string name;
   std::string comment;
+  uint32_t j1939Address = kJ1939NullAddress;
+  uint64_t j1939Name = 0;
   tAttributeValues attributes;
 };
 
-// LIN schedules, which a CAN database file cannot hold: made by callers only.
+// Values of kvPropLINSchedEntry_Type.
+enum class EntryType : uint32_t { kUnconditional = 0, kSporadic = 1, kEventTriggered = 2, kDiagnostic = 3 };
+// Values of kvPropLINSched_RunMode.
+enum class RunMode : uint32_t { kContinuous = 0, kOnce = 1, kNull = 2 };
+
+// LIN schedules, which a CAN database file cannot hold: made by callers only. Frames and the
+// schedule that resolves collisions are named in the cluster.
 struct tLinScheduleEntry {
   std::string name;
+  double delay = 0.0;  // seconds from this entry to the next
+  uint32_t eventId = 0;
+  EntryType type = EntryType::kUnconditional;
+  std::vector<std::string> frames;
+  std::string collisionSchedule;  // empty: none
+  std::vector<uint8_t> diagnosticBytes;  // a diagnostic entry's node configuration data
 };
 
 struct tLinSchedule {
   std::string name;
+  std::string comment;
+  uint32_t priority = 0;  // 0 is the lowest; 1..254 may interrupt
+  RunMode runMode = RunMode::kContinuous;
   std::list<tLinScheduleEntry> entries;
 };
 
@@ -167,6 +202,13 @@ uint32_t MaxFrameId(bool extended);
 const tSignal *FindSignal(const tFrame &frame, std::string_view name);
 // The frame's multiplexer, or null for a frame without one.
 const tSignal *FindMultiplexer(const tFrame &frame);
+
+// What refers to a frame by its name follows when it is renamed, and forgets it when it goes: the
+// frames that carry it as a PDU and the LIN schedule entries that send it.
+void RenameFrameReferences(tCluster *cluster, const std::string &from, const std::string &to);
+void ForgetFrame(tCluster *cluster, const std::string &name);
+// The entries that resolve their collisions with a schedule follow it in the same way.
+void RenameScheduleReferences(tCluster *cluster, const std::string &from, const std::string &to);
 
 // The name that a subframe read from a file has: "m" and the multiplexer's value.
 std::string SubframeName(uint32_t muxValue);

@@ -55,10 +55,13 @@ inline const void *ObjectOf(const tObjectRef &ref) {
   }
 }
 
-// Hands out the handle of an object, the same for as long as the object lives.
+// Hands out the handle of an object, the same for as long as the object lives, and finds the
+// object of a handle that a caller gives back.
 class iObjectHandles {
  public:
   virtual uint32_t HandleOf(const tObjectRef &ref) = 0;
+  // Null for a handle of no object of the same database.
+  virtual const tObjectRef *Find(uint32_t handle) = 0;
 
  protected:
   ~iObjectHandles() = default;

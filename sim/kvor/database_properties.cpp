@@ -1,11 +1,12 @@
 #include "database_properties.h"
 
-#include <cmath>
+#include <algorithm>
 #include <cstring>
 #include <optional>
 #include <string>
 #include <vector>
 
+#include "database_protocol_properties.h"
 #include "kvorproperties.h"
 #include "kvsim.h"
 #include "kvsvplatform.h"
@@ -20,9 +21,14 @@ constexpr uint32_t kSignalClusterRef = 0x05030034u;
 constexpr uint32_t kSubframeClusterRef = 0x05040006u;
 constexpr uint32_t kEntryClusterRef = 0x05070009u;
 
-// A PDU of a classic frame starts with the frame and has no update bit.
-constexpr uint32_t kPduStartBit = 0;
-constexpr uint32_t kNoUpdateBit = 0xFFFFFFFFu;
+// Values of kvPropFrm_CANTimingType that a frame of a database file can have.
+constexpr uint32_t kCyclicData = 0;
+constexpr uint32_t kEventData = 1;
+
+// Values of kvPropClst_ApplicationProtocol and kvPropFrm_ApplicationProtocol, and of
+// kvPropClst_CanFdIsoMode.
+constexpr uint32_t kNoApplicationProtocol = 0;
+constexpr uint32_t kCanFdIso = 0;
 
 template <class T>
 PropertyValue Plain(T value) {
@@ -72,6 +78,37 @@ PropertyValue SignalHandles(const tObjectRef &frameRef, iObjectHandles &handles,
 
 bool IsMultiplexed(const tFrame &frame) { return FindMultiplexer(frame) != nullptr; }
 
+tFrame *FrameNamed(tCluster &cluster, const std::string &name) {
+  for (tFrame &frame : cluster.frames) {
+    if (frame.name == name) return &frame;
+  }
+  return nullptr;
+}
+
+// The frames of the cluster named in `names`, as handles of `objectClass`.
+PropertyValue NamedFrameHandles(const tObjectRef &from, const std::vector<std::string> &names,
+                                uint32_t objectClass, iObjectHandles &handles) {
+  std::vector<uint32_t> list;
+  for (const std::string &name : names) {
+    if (tFrame *frame = FrameNamed(*from.cluster, name)) {
+      list.push_back(handles.HandleOf(FrameRef(from, frame, objectClass)));
+    }
+  }
+  return HandleArrayValue(list);
+}
+
+// The frames that carry the PDU of `pdu`.
+PropertyValue CarryingFrames(const tObjectRef &pdu, iObjectHandles &handles) {
+  std::vector<uint32_t> list;
+  for (tFrame &frame : pdu.cluster->frames) {
+    const tPduMapping mapping = PduMappingOf(frame);
+    if (std::find(mapping.pdus.begin(), mapping.pdus.end(), pdu.frame->name) != mapping.pdus.end()) {
+      list.push_back(handles.HandleOf(FrameRef(pdu, &frame)));
+    }
+  }
+  return HandleArrayValue(list);
+}
+
 PropertyValue SubframeHandles(const tObjectRef &frameRef, iObjectHandles &handles) {
   AddMissingSubframes(frameRef.frame);
   std::vector<uint32_t> list;
@@ -120,8 +157,6 @@ PropertyValue DefaultPayload(const tFrame &frame) {
 std::optional<PropertyValue> FrameOrPduProperty(const tObjectRef &object, uint32_t id,
                                                 iObjectHandles &handles) {
   tFrame &frame = *object.frame;
-  const tObjectRef pdu = FrameRef(object, object.frame, kClassPdu);
-  const tObjectRef asFrame = FrameRef(object, object.frame);
   switch (id) {
     case kvPropFrm_ClusterRef:
     case kvPropPDU_ClusterRef:
@@ -164,7 +199,7 @@ std::optional<PropertyValue> FrameOrPduProperty(const tObjectRef &object, uint32
       break;
   }
   if (object.objectClass == kClassPdu) {
-    if (id == kvPropPDU_FrmRefs) return HandleArrayValue({handles.HandleOf(asFrame)});
+    if (id == kvPropPDU_FrmRefs) return CarryingFrames(object, handles);
     return std::nullopt;
   }
   switch (id) {
@@ -176,12 +211,16 @@ std::optional<PropertyValue> FrameOrPduProperty(const tObjectRef &object, uint32
       return Plain(frame.cycleTimeMs / 1000.0);
     case kvPropFrm_CANioMode:
       return Plain(static_cast<uint32_t>(frame.format));
+    case kvPropFrm_CANTimingType:
+      return Plain(frame.cycleTimeMs > 0.0 ? kCyclicData : kEventData);
+    case kvPropFrm_ApplicationProtocol:
+      return Plain(kNoApplicationProtocol);
     case kvPropFrm_PDURefs:
-      return HandleArrayValue({handles.HandleOf(pdu)});
+      return NamedFrameHandles(object, PduMappingOf(frame).pdus, kClassPdu, handles);
     case kvPropFrm_PDUStartBits:
-      return HandleArrayValue({kPduStartBit});
+      return HandleArrayValue(PduMappingOf(frame).startBits);
     case kvPropFrm_PDUUpdateBits:
-      return HandleArrayValue({kNoUpdateBit});
+      return HandleArrayValue(PduMappingOf(frame).updateBits);
     default:
       return std::nullopt;
   }
@@ -264,10 +303,52 @@ std::optional<PropertyValue> SubframeProperty(const tObjectRef &object, uint32_t
       return Plain(handles.HandleOf(FrameRef(object, object.frame, kClassPdu)));
     case kvPropSubfrm_MuxValue:
       return Plain(subframe.muxValue);
+    case kvPropSubfrm_ConfigStatus:
+      for (const tSignal &signal : object.frame->signals) {
+        const bool own = signal.mux == MuxRole::kMultiplexed && signal.muxValue == subframe.muxValue;
+        if (own && !SignalFits(signal, object.frame->payloadLength)) {
+          return Plain(static_cast<uint32_t>(kvsimErrSignalLayout));
+        }
+      }
+      return Plain(uint32_t{0});
     case kvPropSubfrm_DynSigRefs:
       return SignalHandles(object, handles, [&](const tSignal &s) {
         return s.mux == MuxRole::kMultiplexed && s.muxValue == subframe.muxValue;
       });
+    default:
+      return std::nullopt;
+  }
+}
+
+tObjectRef ScheduleRef(const tObjectRef &from, tLinSchedule *schedule) {
+  tObjectRef ref = ClusterRef(from);
+  ref.objectClass = kClassLinSchedule;
+  ref.schedule = schedule;
+  return ref;
+}
+
+std::optional<PropertyValue> EntryProperty(const tObjectRef &object, uint32_t id,
+                                           iObjectHandles &handles) {
+  const tLinScheduleEntry &entry = *object.entry;
+  switch (id) {
+    case kvPropLINSchedEntry_Delay:
+      return Plain(entry.delay);
+    case kvPropLINSchedEntry_EventID:
+      return Plain(entry.eventId);
+    case kvPropLINSchedEntry_Type:
+      return Plain(static_cast<uint32_t>(entry.type));
+    case kvPropLINSchedEntry_Frames:
+      return NamedFrameHandles(object, entry.frames, kClassFrame, handles);
+    case kvPropLINSchedEntry_NC_FF_DataBytes:
+      return PropertyValue(entry.diagnosticBytes);
+    case kvPropLINSchedEntry_CollisionResSched:
+      // An entry that resolves no collisions has no value here.
+      for (tLinSchedule &schedule : object.cluster->linSchedules) {
+        if (!entry.collisionSchedule.empty() && schedule.name == entry.collisionSchedule) {
+          return Plain(handles.HandleOf(ScheduleRef(object, &schedule)));
+        }
+      }
+      return std::nullopt;
     default:
       return std::nullopt;
   }
@@ -283,19 +364,23 @@ std::optional<PropertyValue> ScheduleProperty(const tObjectRef &object, uint32_t
         return TextValue(object.schedule->name + "." + object.entry->name);
       case kEntryClusterRef:
         return Plain(handles.HandleOf(ClusterRef(object)));
-      case kvPropLINSchedEntry_Sched: {
-        tObjectRef schedule = ClusterRef(object);
-        schedule.objectClass = kClassLinSchedule;
-        schedule.schedule = object.schedule;
-        return Plain(handles.HandleOf(schedule));
-      }
+      case kvPropLINSchedEntry_Sched:
+        return Plain(handles.HandleOf(ScheduleRef(object, object.schedule)));
       default:
-        return std::nullopt;
+        return EntryProperty(object, id, handles);
     }
   }
   switch (id) {
     case kvPropLINSched_Name:
       return TextValue(object.schedule->name);
+    case kvPropLINSched_Comment:
+      return TextValue(object.schedule->comment);
+    case kvPropLINSched_Priority:
+      return Plain(object.schedule->priority);
+    case kvPropLINSched_RunMode:
+      return Plain(static_cast<uint32_t>(object.schedule->runMode));
+    case kvPropLINSched_ConfigStatus:
+      return Plain(uint32_t{0});
     case kvPropLINSched_ClstRef:
       return Plain(handles.HandleOf(ClusterRef(object)));
     case kvPropLINSched_Entries: {
@@ -346,6 +431,10 @@ std::optional<PropertyValue> EcuProperty(const tObjectRef &object, uint32_t id,
       return frames(true);
     case kvPropECU_RxFrmRefs:
       return frames(false);
+    case kvPropECU_J1939PreferredAddress:
+      return Plain(ecu.j1939Address);
+    case kvPropECU_J1939NodeName:
+      return Plain(ecu.j1939Name);
     default:
       return std::nullopt;
   }
@@ -371,6 +460,10 @@ std::optional<PropertyValue> ClusterProperty(const tObjectRef &object, uint32_t 
       return Plain(uint32_t{0});
     case kvPropClst_PDUsReqd:
       return BoolValue(false);
+    case kvPropClst_ApplicationProtocol:
+      return Plain(kNoApplicationProtocol);
+    case kvPropClst_CanFdIsoMode:
+      return Plain(kCanFdIso);
     case kvPropClst_BaudRate:
       if (cluster.baudRate > UINT32_MAX) return std::nullopt;
       return Plain(static_cast<uint32_t>(cluster.baudRate));
@@ -445,201 +538,14 @@ std::optional<PropertyValue> DatabaseProperty(const tObjectRef &object, uint32_t
   }
 }
 
-// ---- Setting ----------------------------------------------------------------------------------
-
-struct tCallerValue {
-  PropertyValue bytes;
-  uint32_t U32() const { return Read<uint32_t>(); }
-  uint64_t U64() const { return Read<uint64_t>(); }
-  double F64() const { return Read<double>(); }
-  bool Bool() const { return bytes[0] != 0; }
-  std::string Text() const { return std::string(reinterpret_cast<const char *>(bytes.data())); }
-
-  template <class T>
-  T Read() const {
-    T value;
-    std::memcpy(&value, bytes.data(), sizeof value);
-    return value;
-  }
-};
-
-// A new name for one of `siblings`, which must stay apart.
-template <class List>
-Status Rename(List &siblings, std::string *name, const std::string &wanted) {
-  if (!IsIdentifier(wanted)) return kvsimErrInvalidName;
-  for (const auto &sibling : siblings) {
-    if (&sibling.name != name && sibling.name == wanted) return kvsimErrObjectExists;
-  }
-  *name = wanted;
-  return 0;
-}
-
-bool IdTaken(const tCluster &cluster, const tFrame &self, uint32_t id, bool extended) {
-  for (const tFrame &frame : cluster.frames) {
-    if (&frame != &self && frame.id == id && frame.extended == extended) return true;
-  }
-  return false;
-}
-
-Status SetFrame(const tObjectRef &object, uint32_t id, const tCallerValue &value) {
-  tFrame &frame = *object.frame;
-  switch (id) {
-    case kvPropFrm_Name:
-      return Rename(object.cluster->frames, &frame.name, value.Text());
-    case kvPropFrm_Comment:
-      frame.comment = value.Text();
-      return 0;
-    case kvPropFrm_ID:
-      if (value.U32() > MaxFrameId(frame.extended)) return kvsimErrInvalidArgument;
-      if (IdTaken(*object.cluster, frame, value.U32(), frame.extended)) return kvsimErrObjectExists;
-      frame.id = value.U32();
-      return 0;
-    case kvPropFrm_CANExtID:
-      if (frame.id > MaxFrameId(value.Bool())) return kvsimErrInvalidArgument;
-      if (IdTaken(*object.cluster, frame, frame.id, value.Bool())) return kvsimErrObjectExists;
-      frame.extended = value.Bool();
-      return 0;
-    case kvPropFrm_PayloadLen:
-      if (!IsValidPayloadLength(value.U32())) return kvsimErrInvalidArgument;
-      frame.payloadLength = value.U32();
-      if (frame.payloadLength > 8) frame.format = FrameFormat::kCanFd;
-      return 0;
-    case kvPropFrm_CANTxTime:
-      if (!(value.F64() >= 0.0) || std::isinf(value.F64())) return kvsimErrInvalidArgument;
-      frame.cycleTimeMs = value.F64() * 1000.0;
-      return 0;
-    case kvPropFrm_CANioMode:
-      if (value.U32() > static_cast<uint32_t>(FrameFormat::kCanFd)) return kvsimErrInvalidArgument;
-      // Only CAN FD carries more than 8 bytes.
-      if (value.U32() == 0 && frame.payloadLength > 8) return kvsimErrInvalidArgument;
-      frame.format = static_cast<FrameFormat>(value.U32());
-      return 0;
-    default:
-      return kvsimErrPropertyReadOnly;
-  }
-}
-
-Status SetSignal(const tObjectRef &object, uint32_t id, const tCallerValue &value) {
-  tSignal &signal = *object.signal;
-  switch (id) {
-    case kvPropSig_Name:
-      return Rename(object.frame->signals, &signal.name, value.Text());
-    case kvPropSig_Comment:
-      signal.comment = value.Text();
-      return 0;
-    case kvPropSig_Unit:
-      signal.unit = value.Text();
-      return 0;
-    case kvPropSig_ByteOrdr:
-      if (value.U32() > static_cast<uint32_t>(ByteOrder::kBigEndian)) return kvsimErrInvalidArgument;
-      signal.byteOrder = static_cast<ByteOrder>(value.U32());
-      return 0;
-    case kvPropSig_DataType:
-      if (value.U32() > static_cast<uint32_t>(SignalType::kFloat)) return kvsimErrInvalidArgument;
-      signal.type = static_cast<SignalType>(value.U32());
-      return 0;
-    case kvPropSig_NumBits:
-      if (value.U32() < 1 || value.U32() > 64) return kvsimErrInvalidArgument;
-      signal.numBits = value.U32();
-      return 0;
-    case kvPropSig_StartBit:
-      if (value.U32() >= 64 * 8) return kvsimErrInvalidArgument;
-      signal.startBit = value.U32();
-      return 0;
-    case kvPropSig_ScaleFac:
-      if (value.F64() == 0.0 || !std::isfinite(value.F64())) return kvsimErrInvalidArgument;
-      signal.scale = value.F64();
-      return 0;
-    case kvPropSig_ScaleOff:
-      if (!std::isfinite(value.F64())) return kvsimErrInvalidArgument;
-      signal.offset = value.F64();
-      return 0;
-    case kvPropSig_Min:
-      signal.minimum = value.F64();
-      return 0;
-    case kvPropSig_Max:
-      signal.maximum = value.F64();
-      return 0;
-    case kvPropSig_Default:
-      signal.defaultRaw = (value.F64() - signal.offset) / signal.scale;
-      return 0;
-    case kvPropSig_MuxIsDataMux:
-      if (value.Bool()) {
-        const tSignal *multiplexer = FindMultiplexer(*object.frame);
-        if (multiplexer != nullptr && multiplexer != &signal) return kvsimErrObjectExists;
-        signal.mux = MuxRole::kMultiplexer;
-      } else if (signal.mux == MuxRole::kMultiplexer) {
-        signal.mux = MuxRole::kPlain;
-      }
-      return 0;
-    case kvPropSig_MuxIsDynamic:
-      if (value.Bool()) {
-        signal.mux = MuxRole::kMultiplexed;
-      } else if (signal.mux == MuxRole::kMultiplexed) {
-        signal.mux = MuxRole::kPlain;
-      }
-      return 0;
-    case kvPropSig_MuxValue:
-      signal.muxValue = value.U32();
-      return 0;
-    default:
-      return kvsimErrPropertyReadOnly;
-  }
-}
-
-Status SetEcu(const tObjectRef &object, uint32_t id, const tCallerValue &value) {
-  tEcu &ecu = *object.ecu;
-  if (id == kvPropECU_Comment) {
-    ecu.comment = value.Text();
-    return 0;
-  }
-  if (id != kvPropECU_Name) return kvsimErrPropertyReadOnly;
-  const std::string old = ecu.name;
-  const Status status = Rename(object.cluster->ecus, &ecu.name, value.Text());
-  if (status != 0) return status;
-  // The frames name their nodes by text, so they follow the rename.
-  for (tFrame &frame : object.cluster->frames) {
-    if (frame.transmitter == old) frame.transmitter = ecu.name;
-    for (tSignal &signal : frame.signals) {
-      for (std::string &receiver : signal.receivers) {
-        if (receiver == old) receiver = ecu.name;
-      }
-    }
-  }
-  return 0;
-}
-
-Status SetCluster(const tObjectRef &object, uint32_t id, const tCallerValue &value) {
-  tCluster &cluster = *object.cluster;
-  switch (id) {
-    case kvPropClst_Name:
-      return Rename(object.database->clusters, &cluster.name, value.Text());
-    case kvPropClst_Comment:
-      cluster.comment = value.Text();
-      return 0;
-    case kvPropClst_BaudRate:
-      cluster.baudRate = value.U32();
-      return 0;
-    case kvPropClst_BaudRate64:
-      cluster.baudRate = value.U64();
-      return 0;
-    case kvPropClst_CanFdBaudRate:
-      cluster.fdBaudRate = value.U32();
-      return 0;
-    case kvPropClst_CanFdBaudRate64:
-      cluster.fdBaudRate = value.U64();
-      return 0;
-    default:
-      return kvsimErrPropertyReadOnly;
-  }
-}
-
 }  // namespace
 
 Status GetDatabaseProperty(const tObjectRef &object, uint32_t id, iObjectHandles &handles,
                            PropertyValue *value) {
   // A property of another class never belongs to the object.
   if ((id & 0xFF0000u) != object.objectClass) return kvsimErrPropertyUnknown;
+  // Every cluster here is a CAN cluster.
+  if (IsFlexRayOrLinProperty(id)) return kvsimErrWrongProtocol;
   std::optional<PropertyValue> found;
   switch (object.objectClass) {
     case kClassDatabase:
@@ -671,35 +577,6 @@ Status GetDatabaseProperty(const tObjectRef &object, uint32_t id, iObjectHandles
   if (!found) return kvsimErrPropertyUnknown;
   *value = std::move(*found);
   return 0;
-}
-
-Status SetDatabaseProperty(const tObjectRef &object, uint32_t id, uint32_t size,
-                           const void *value) {
-  if ((id & 0xFF0000u) != object.objectClass) return kvsimErrPropertyUnknown;
-  tCallerValue caller;
-  const Status status = ValueFromCaller(id, size, value, &caller.bytes);
-  if (status != 0) return status;
-  // Types without a fixed size come back as they were given; only text can be set among them.
-  const uint32_t type = id >> 24;
-  if (type != 0x00 && type != 0x01 && type != 0x02 && type != 0x03 && type != 0x09) {
-    return kvsimErrPropertyReadOnly;
-  }
-  switch (object.objectClass) {
-    case kClassDatabase:
-      if (id != kvPropDatabase_ShowInvalidFromOpen) return kvsimErrPropertyReadOnly;
-      object.database->showInvalidFromOpen = caller.Bool();
-      return 0;
-    case kClassCluster:
-      return SetCluster(object, id, caller);
-    case kClassFrame:
-      return SetFrame(object, id, caller);
-    case kClassSignal:
-      return SetSignal(object, id, caller);
-    case kClassEcu:
-      return SetEcu(object, id, caller);
-    default:
-      return kvsimErrPropertyReadOnly;
-  }
 }
 
 }  // namespace nKvorSim

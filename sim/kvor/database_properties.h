@@ -15,10 +15,11 @@ namespace nKvorSim {
 Status GetDatabaseProperty(const tObjectRef &object, uint32_t id, iObjectHandles &handles,
                            PropertyValue *value);
 
-// Sets property `id` of the object from the caller's `size` bytes. References and everything
-// that follows from other properties are read-only; names must stay identifiers, unique among
-// their siblings, and frame identifiers unique in their cluster.
-Status SetDatabaseProperty(const tObjectRef &object, uint32_t id, uint32_t size, const void *value);
+// Sets property `id` of the object from the caller's `size` bytes; handles in the value are found
+// through `handles`. What follows from other properties is read-only; names must stay
+// identifiers, unique among their siblings, and frame identifiers unique in their cluster.
+Status SetDatabaseProperty(const tObjectRef &object, uint32_t id, uint32_t size, const void *value,
+                           iObjectHandles &handles);
 
 }  // namespace nKvorSim
 

@@ -29,6 +29,10 @@ class DatabaseRegistry::cHandleSource final : public iObjectHandles {
   cHandleSource(DatabaseRegistry &registry, tLoaded *loaded)
       : registry_(registry), loaded_(loaded) {}
   uint32_t HandleOf(const tObjectRef &ref) override { return registry_.HandleOf(loaded_, ref); }
+  const tObjectRef *Find(uint32_t handle) override {
+    const tEntry *entry = registry_.Resolve(handle);
+    return entry != nullptr && entry->loaded == loaded_ ? &entry->ref : nullptr;
+  }
 
  private:
   DatabaseRegistry &registry_;
@@ -233,6 +237,9 @@ Status DatabaseRegistry::GetProperty(uint32_t object, uint32_t id, uint32_t size
   PropertyValue known;
   const Status status = GetDatabaseProperty(entry->ref, id, handles, &known);
   if (status != 0) return status;
+  // A value of fixed size is read whole or not at all.
+  const uint32_t fixed = FixedValueSize(id);
+  if (fixed != 0 && size != fixed) return kvsimErrPropertySize;
   return CopyValueOut(known, size, value);
 }
 
@@ -241,12 +248,16 @@ Status DatabaseRegistry::SetProperty(uint32_t object, uint32_t id, uint32_t size
   std::lock_guard<std::mutex> lock(mutex_);
   tEntry *entry = Resolve(object);
   if (entry == nullptr) return kvsimErrInvalidDatabase;
-  // A property that the object does not have is unknown, not read-only.
   cHandleSource handles(*this, entry->loaded);
   PropertyValue current;
   const Status known = GetDatabaseProperty(entry->ref, id, handles, &current);
-  if (known != 0) return known;
-  return SetDatabaseProperty(entry->ref, id, size, value);
+  const Status status = SetDatabaseProperty(entry->ref, id, size, value, handles);
+  // A property that the object does not have, or not for its protocol, is that rather than
+  // read-only; one that has no value yet may still be set.
+  if (known != 0 && (status == kvsimErrPropertyReadOnly || status == kvsimErrPropertySize)) {
+    return known;
+  }
+  return status;
 }
 
 Status DatabaseRegistry::Save(uint32_t handle, const char *path) {

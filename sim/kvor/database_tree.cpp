@@ -263,10 +263,13 @@ Status DeleteObject(const tObjectRef &object, std::set<const void *> *gone) {
       Erase(object.database->clusters, object.cluster);
       return 0;
     case kClassFrame:
-    case kClassPdu:
+    case kClassPdu: {
+      const std::string name = object.frame->name;
       gone->insert(object.frame);
       Erase(object.cluster->frames, object.frame);
+      ForgetFrame(object.cluster, name);
       return 0;
+    }
     case kClassSignal:
       gone->insert(object.signal);
       Erase(object.frame->signals, object.signal);
@@ -300,10 +303,13 @@ Status DeleteObject(const tObjectRef &object, std::set<const void *> *gone) {
       Erase(object.cluster->ecus, object.ecu);
       return 0;
     }
-    case kClassLinSchedule:
+    case kClassLinSchedule: {
+      const std::string name = object.schedule->name;
       gone->insert(object.schedule);
       Erase(object.cluster->linSchedules, object.schedule);
+      RenameScheduleReferences(object.cluster, name, "");
       return 0;
+    }
     case kClassLinScheduleEntry:
       gone->insert(object.entry);
       Erase(object.schedule->entries, object.entry);

@@ -52,6 +52,8 @@ constexpr StatusText kTexts[] = {
     {kvsimErrInvalidName, "The name is not a valid database object name."},
     {kvsimErrDatabaseWrite, "The database cannot be saved at that place."},
     {kvsimErrSignalLayout, "A signal does not fit its frame, or overlaps another signal."},
+    {kvsimErrWrongObject,
+     "The reference names no object of the property's class in the object's cluster."},
     {kvsimErrInvalidFrame,
      "The frame buffer holds a malformed record, or a payload longer than the session allows."},
 

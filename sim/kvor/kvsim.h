@@ -39,10 +39,25 @@
  *                     counts it. Sub-properties are kept per list item: the index must be below
  *                     NumInList. A read whose buffer is smaller than the value is refused whole,
  *                     except a 1-byte read of a type 0x00 value, which gets its low byte.
+ *                     Values that name objects are checked when set, and then kept as set:
+ *                     kvPropSession_J1939ECU is the handle of an ECU, and
+ *                     kvPropSession_IntfOutStrmList handles of frames (a size that is a multiple
+ *                     of 4), each of a loaded database (else kvsimErrInvalidDatabase; an object
+ *                     of another class: kvsimErrInvalidClass; an error object: its status).
+ *                     kvPropSession_IntfEnetEptReceiveFilter, on Ethernet sessions only (else
+ *                     kvsimErrWrongProtocol), is an array of 28-byte records, empty until set:
+ *                     flags (4 bytes: bit 0 the 16-bit value, bit 1 the 8-bit value, bit 2 the
+ *                     name are in force), the 16-bit value, the 8-bit value, a name of 21 bytes.
+ *                     A size that is not a multiple of 28 is kvsimErrPropertySize; a flag beyond
+ *                     bit 2, or a name without its NUL in its 21 bytes, kvsimErrInvalidArgument.
+ *                     Paths, such as kvPropSession_EnetLogFile and kvPropSession_IntfCustCodeFile,
+ *                     are texts like any other.
  *   System objects    Read-only: kvPropSys_Ver* (4 bytes), DevRefs, IntfRefs, IntfRefsAll,
- *                     IntfRefsCAN/FlexRay/LIN/Ethernet (arrays of 4-byte handles);
- *                     kvPropDev_Name, SerNum, ProductNum, NumPorts, NumPortsAll, IntfRefs,
- *                     IntfRefsAll; kvPropIntf_Name, Protocol, Num, PortNum, DevRef.
+ *                     IntfRefsCAN/FlexRay/LIN/Ethernet (arrays of 4-byte handles, in device and
+ *                     port order);
+ *                     kvPropDev_Name, SerNum (the serials above), ProductNum, NumPorts,
+ *                     NumPortsAll, IntfRefs, IntfRefsAll; kvPropIntf_Name, Protocol, Num,
+ *                     PortNum, DevRef (the handle of its device).
  *   Error sessions    kvhdnCreateErrorSession takes a negative status only. Every call on the
  *                     handle returns that status and touches no output, except kvClear and
  *                     kvSystemClose, which end the error session and return 0.
@@ -222,16 +237,44 @@
  *                     the user's configuration directory; tests that add aliases set it.
  *                     kvdbGetDBCAttribute gives an enumeration's value as its text; a
  *                     warning about what a file from another tool broke is left in
- *                     kvsimDatabaseErrorText after a good open. Properties: names, comments,
+ *                     kvsimDatabaseErrorText after a good open.
+ *   Database properties
+ *                     Every property of the identifier table of classes 0x00 to 0x08 is
+ *                     answered, except kvPropFrm_PDU_Mapping (kvsimErrPropertyUnknown). Every
+ *                     cluster is a CAN cluster: the FlexRay and LIN properties of clusters,
+ *                     frames and ECUs are kvsimErrWrongProtocol, on read and on set (LIN
+ *                     schedules and their entries are not among them). Can be set: names
+ *                     (identifiers, unique among siblings: kvsimErrInvalidName,
+ *                     kvsimErrObjectExists), comments; cluster BaudRate(64), CanFdBaudRate(64);
  *                     frame ID, CANExtID, PayloadLen, CANTxTime, CANioMode (0 CAN, 1 CAN FD),
- *                     signal StartBit, NumBits, ByteOrdr (0 little-endian, 1 big-endian),
- *                     DataType (0 signed, 1 unsigned, 2 IEEE float), ScaleFac, ScaleOff, Min,
- *                     Max, Default, Unit, Mux* can be set; references, DefaultPayload,
- *                     ConfigStatus, NameUniqueToCluster ("frame.signal") and the PDU's follow
- *                     from them. A frame's PDU is the frame's payload: one PDU per frame at
- *                     start bit 0 with update bit 0xFFFFFFFF (none). Subframes, LIN schedules and
- *                     their entries answer their names, cluster references and the references
- *                     between them only.
+ *                     PDURefs, PDUStartBits, PDUUpdateBits; signal StartBit, NumBits, ByteOrdr
+ *                     (0 little-endian, 1 big-endian), DataType (0 signed, 1 unsigned, 2 IEEE
+ *                     float), ScaleFac, ScaleOff, Min, Max, Default, Unit, Mux*; ECU TxFrmRefs,
+ *                     RxFrmRefs, J1939PreferredAddress (0..254, 254 the default), J1939NodeName;
+ *                     the PDU's Name, Comment and PayloadLen, which are its frame's; LIN schedule
+ *                     Priority (0..254), RunMode (0 continuous, 1 once, 2 null); entry Delay
+ *                     (seconds, not negative), EventID (0..63), Type (0 unconditional,
+ *                     1 sporadic, 2 event-triggered, 3 diagnostic), Frames, CollisionResSched
+ *                     (size 0: none; read with none: kvsimErrPropertyUnknown), NC_FF_DataBytes
+ *                     (up to 8). Everything else follows from these and is
+ *                     kvsimErrPropertyReadOnly: references, DefaultPayload, ConfigStatus,
+ *                     NameUniqueToCluster ("frame.signal"), CANTimingType (0 cyclic with a
+ *                     cycle time, 1 on events), ApplicationProtocol (0 none), CanFdIsoMode
+ *                     (0 ISO). A frame carries its own PDU (the PDU of a frame is the frame's
+ *                     payload) at start bit 0 with update bit 0xFFFFFFFF (none) until its PDUs
+ *                     are set: references of PDUs of its cluster, and bits inside its payload
+ *                     (an update bit may also be 0xFFFFFFFF). An ECU's TxFrmRefs makes it the
+ *                     transmitter of exactly those frames; its RxFrmRefs a receiver of each
+ *                     signal of exactly those (a frame without signals:
+ *                     kvsimErrInvalidArgument). A saved database keeps all but the PDUs,
+ *                     J1939 values and LIN schedules, which a database file cannot hold.
+ *                     Refusals: a property of another class, or one that the object has no
+ *                     value for, kvsimErrPropertyUnknown; a read of a 4-, 8- or 1-byte type
+ *                     with another size, or a set of such a type with another size or of an
+ *                     array not in whole 4-byte items, kvsimErrPropertySize; a read into a
+ *                     buffer smaller than the value, kvsimErrBufferTooSmall; a value out of
+ *                     its range, kvsimErrInvalidArgument; a handle of another class or
+ *                     cluster in a reference, kvsimErrWrongObject.
  *   kvdbCloseDatabase Answers kvsimErrInvalidDatabase for a handle of no loaded database; the handle
  *                     of an object deleted from one still gives back one open of it.
  *   Error handles     kvBlink and kvdbCloseDatabase also answer an error session, given in place
@@ -669,9 +712,12 @@ enum kvsimDatabaseStatus {
                                                      letters, digits and '_') */
   kvsimErrDatabaseWrite = (int32_t)0xBFF62067,    /* the database cannot be saved there, or cannot
                                                      be written as a database file */
-  kvsimErrSignalLayout = (int32_t)0xBFF62068      /* kvPropSig_ConfigStatus, kvPropFrm_ConfigStatus:
+  kvsimErrSignalLayout = (int32_t)0xBFF62068,     /* kvPropSig_ConfigStatus, kvPropFrm_ConfigStatus:
                                                      a signal does not fit its frame, or a frame
                                                      has multiplexed signals and no multiplexer */
+  kvsimErrWrongObject = (int32_t)0xBFF62069       /* a handle set into a reference property is not
+                                                     one of an object of the class that the
+                                                     property refers to, in the same cluster */
 };
 
 /* Copies the message of the latest open, save or alias that failed on its file ("tesla.dbc,

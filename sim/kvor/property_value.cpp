@@ -36,6 +36,8 @@ uint32_t FixedSize(uint32_t type) {
 
 }  // namespace
 
+uint32_t FixedValueSize(uint32_t id) { return FixedSize(id >> 24); }
+
 PropertyValue U32Value(uint32_t value) {
   PropertyValue bytes(sizeof value);
   std::memcpy(bytes.data(), &value, sizeof value);

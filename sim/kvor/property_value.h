@@ -19,6 +19,10 @@ PropertyValue TextValue(std::string_view text);
 // An array of 4-byte object handles.
 PropertyValue HandleArrayValue(const std::vector<uint32_t> &handles);
 
+// Byte size of the values of `id`'s type when it is fixed (4, 8 or 1); 0 for the types whose
+// size the value decides.
+uint32_t FixedValueSize(uint32_t id);
+
 // Copies `value` into the caller's buffer of `size` bytes; a smaller buffer is refused whole.
 Status CopyValueOut(const PropertyValue &value, uint32_t size, void *out);
 
