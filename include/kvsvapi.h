@@ -888,6 +888,75 @@ KVSV_EXPORT kvsvStatus kvsvdbGetPropRef(uint32_t object, uint32_t id, SvHandle *
 KVSV_EXPORT kvsvStatus kvsvdbGetPropRef1D(uint32_t object, uint32_t id, SvHandle *value,
                                           SvHandle *info);
 
+/* Sets property `id` of `object` to the object named by the reference text `*value`. Only a LIN
+ * schedule entry's collision-resolving schedule (0x05070001) can be set so; a null or empty text
+ * clears any reference property. A text property or any other identifier gives the internal
+ * error; a text that names no LIN schedule gives 0xBFF63163, 0xBFF63164, 0xBFF63173 or the
+ * driver's status. The database that the text opens stays open. */
+KVSV_EXPORT kvsvStatus kvsvdbSetPropRef(uint32_t object, uint32_t id, SvHandle *value,
+                                        SvHandle *info);
+/* Sets the list property `id` of `object` to the objects named by the array of reference texts
+ * `*value`: PDUs for a frame's PDU list (0x06020060), frames for an ECU's received and sent frames
+ * and a LIN schedule entry's frames. A null or empty array clears the list. The first text that
+ * cannot be resolved ends the walk and nothing is set; the host's strings are only read. */
+KVSV_EXPORT kvsvStatus kvsvdbSetPropRef1D(uint32_t object, uint32_t id, SvHandle *value,
+                                          SvHandle *info);
+
+/* Single values: U32, U64, F64, Bool (1 byte), read into and written from *value. */
+KVSV_EXPORT kvsvStatus kvsvdbGetPropU32(uint32_t object, uint32_t id, uint32_t *value,
+                                        SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvdbSetPropU32(uint32_t object, uint32_t id, const uint32_t *value,
+                                        SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvdbGetPropU64(uint32_t object, uint32_t id, uint64_t *value,
+                                        SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvdbSetPropU64(uint32_t object, uint32_t id, const uint64_t *value,
+                                        SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvdbGetPropF64(uint32_t object, uint32_t id, double *value,
+                                        SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvdbSetPropF64(uint32_t object, uint32_t id, const double *value,
+                                        SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvdbGetPropBool(uint32_t object, uint32_t id, uint8_t *value,
+                                         SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvdbSetPropBool(uint32_t object, uint32_t id, const uint8_t *value,
+                                         SvHandle *info);
+
+/* Number arrays of 1 and 4 bytes (count at byte 0, elements from byte 4), as the session family
+ * has them: a read sizes `*value` to what the driver has and stores that count even if the read
+ * fails; a failed size query leaves it as it was. A null or empty array is written as empty. */
+KVSV_EXPORT kvsvStatus kvsvdbGetPropU8_1D(uint32_t object, uint32_t id, SvHandle *value,
+                                          SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvdbSetPropU8_1D(uint32_t object, uint32_t id, SvHandle *value,
+                                          SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvdbGetPropU32_1D(uint32_t object, uint32_t id, SvHandle *value,
+                                           SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvdbSetPropU32_1D(uint32_t object, uint32_t id, SvHandle *value,
+                                           SvHandle *info);
+
+/* Text. A read counts the driver's size less its NUL, also when the read fails (the contents are
+ * then not to be used). A write sends a NUL-terminated copy; a null or empty string is sent as a
+ * single NUL. */
+KVSV_EXPORT kvsvStatus kvsvdbGetPropString(uint32_t object, uint32_t id, SvHandle *value,
+                                           SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvdbSetPropString(uint32_t object, uint32_t id, SvHandle *value,
+                                           SvHandle *info);
+/* A comma list as a new array of strings; `*value` is disposed of with its strings and replaced.
+ * There is no setter: the Set form reports an internal error, 0xBFF63001. */
+KVSV_EXPORT kvsvStatus kvsvdbGetPropString1D(uint32_t object, uint32_t id, SvHandle *value,
+                                             SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvdbSetPropString1D(uint32_t object, uint32_t id, SvHandle *value,
+                                             SvHandle *info);
+
+/* A frame's PDUs (`id` must be kvPropFrm_PDU_Mapping, 0x0802FFFC; any other gives the internal
+ * error and no information) as an array of 16-byte clusters from byte 8: the PDU's reference text,
+ * its start bit, its update bit. A read gives as many elements as the shortest of the three lists
+ * at the driver; each element owns its string, which a later read into the same array reuses. A
+ * write of a null or empty array clears the three lists; otherwise the strings stay the host's.
+ * A null string in an element gives 0xBFF63163 and sets nothing. */
+KVSV_EXPORT kvsvStatus kvsvdbGetPropPDU_Mapping(uint32_t object, uint32_t id, SvHandle *value,
+                                                SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvdbSetPropPDU_Mapping(uint32_t object, uint32_t id, SvHandle *value,
+                                                SvHandle *info);
+
 #ifdef __cplusplus
 }
 #endif

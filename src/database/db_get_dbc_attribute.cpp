@@ -10,13 +10,6 @@
 
 using namespace nKVSVAPI100;
 
-namespace {
-
-// A string handle holds its count and three spare bytes beyond the driver's size.
-constexpr uint32_t kStringSlack = 7;
-
-}  // namespace
-
 extern "C" KVSV_EXPORT kvsvStatus kvsvdbGetDBCAttribute(uint32_t object, uint32_t mode,
                                                         const char *name, SvHandle *value,
                                                         uint32_t *isDefault) {

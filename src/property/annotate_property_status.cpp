@@ -3,6 +3,7 @@
 
 #include <cstring>
 
+#include "core/internal_error.h"
 #include "property/property_id_names.h"
 
 namespace nKVSVAPI100 {
@@ -27,6 +28,10 @@ void AnnotatePropertyStatus(Status status, uint32_t propertyId, SvHandle *info) 
   else
     svStrPrintf(*info, "\nProperty: (unknown ID hex %08lx)",
                 static_cast<unsigned long>(propertyId));
+}
+
+Status ReportMissingSetter(uint32_t file, uint32_t line, uint32_t id, SvHandle *info) {
+  return AnnotatedStatus(ReportInternalError(kComponentKvsvapi, file, line, 0), id, info);
 }
 
 }  // namespace nKVSVAPI100

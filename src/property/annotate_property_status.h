@@ -15,6 +15,16 @@ namespace nKVSVAPI100 {
 // the export's status, so it returns nothing.
 void AnnotatePropertyStatus(Status status, uint32_t propertyId, SvHandle *info);
 
+// Annotates `status` and gives it back, so that an export ends in one expression.
+inline Status AnnotatedStatus(Status status, uint32_t propertyId, SvHandle *info) {
+  AnnotatePropertyStatus(status, propertyId, info);
+  return status;
+}
+
+// Setters that a family does not have: an internal report of source `file` at `line`, annotated
+// as any failure.
+Status ReportMissingSetter(uint32_t file, uint32_t line, uint32_t id, SvHandle *info);
+
 }  // namespace nKVSVAPI100
 
 #endif

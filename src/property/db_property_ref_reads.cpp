@@ -9,6 +9,7 @@
 #include "kvorproperties.h"
 #include "kvsvapi.h"
 #include "property/annotate_property_status.h"
+#include "property/property_id_names.h"
 #include "session/db_reference_strings.h"
 
 using namespace nKVSVAPI100;
@@ -87,11 +88,9 @@ constexpr tRefShape kSingle{kReferenceString, kLineRefIsText, kLineRefUnknown, k
 constexpr tRefShape kList{kReferenceArray, kLineRef1DIsText, kLineRef1DUnknown, kListNames,
                           std::size(kListNames)};
 
-constexpr bool IsTextProperty(uint32_t id) { return (id >> 24) == 0x03u; }
-
 Status ReadReferences(const tRefShape &shape, uint32_t object, uint32_t id, SvHandle *value) {
   // A name has a shape of its own here: a text property is no reference.
-  if (IsTextProperty(id)) {
+  if (PropertyType(id) == kPropertyTypeText) {
     return ReportInternalError(kComponentKvsvapi, nFile::kDatabaseProperties, shape.lineIsText, id);
   }
   uint32_t nameId = 0;
@@ -113,14 +112,10 @@ Status ReadReferences(const tRefShape &shape, uint32_t object, uint32_t id, SvHa
 
 extern "C" KVSV_EXPORT kvsvStatus kvsvdbGetPropRef(uint32_t object, uint32_t id, SvHandle *value,
                                                    SvHandle *info) {
-  const Status status = ReadReferences(kSingle, object, id, value);
-  AnnotatePropertyStatus(status, id, info);
-  return status;
+  return AnnotatedStatus(ReadReferences(kSingle, object, id, value), id, info);
 }
 
 extern "C" KVSV_EXPORT kvsvStatus kvsvdbGetPropRef1D(uint32_t object, uint32_t id,
                                                      SvHandle *value, SvHandle *info) {
-  const Status status = ReadReferences(kList, object, id, value);
-  AnnotatePropertyStatus(status, id, info);
-  return status;
+  return AnnotatedStatus(ReadReferences(kList, object, id, value), id, info);
 }

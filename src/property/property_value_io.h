@@ -44,6 +44,8 @@ struct tDbPropertyCalls {
 
 // Host arrays and strings carry a 32-bit count in front of their data.
 constexpr uint32_t kHostCountBytes = 4;
+// A string handle holds its count and three spare bytes beyond the driver's size.
+constexpr uint32_t kStringSlack = 7;
 
 // Size protocol: the value's size from the driver, the handle made or grown to that size plus
 // `slack`, the value read behind the count, then `afterRead(readStatus, size)` in any case once
@@ -85,6 +87,18 @@ Status ReadTextBlock(uint32_t object, uint32_t id, tMallocBlock &block) {
   if (!block) return kvErrOutOfMemory;
   block.get()[size] = '\0';
   return tCalls::Get(object, id, size, block.get());
+}
+
+// A comma list of the driver as a new host array of strings at `*value`, the old one disposed
+// of with its strings. A failed read leaves `*value` as it was.
+template <class tCalls>
+Status ReadCommaListProperty(uint32_t object, uint32_t id, SvHandle *value) {
+  if (value == nullptr) return kvErrNullArgument;
+  tMallocBlock text;
+  const Status status = ReadTextBlock<tCalls>(object, id, text);
+  if (status < 0) return status;
+  const Status split = CommaListToStringArray(text.get(), value, 0);
+  return split < 0 ? split : status;
 }
 
 // What a write sends: a byte count and a buffer, null for "empty".

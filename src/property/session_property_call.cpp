@@ -2,7 +2,6 @@
 
 #include <algorithm>
 
-#include "core/internal_error.h"
 #include "property/session_name_to_index.h"
 
 namespace nKVSVAPI100 {
@@ -16,12 +15,6 @@ Status SetSessionPropertyValue(uint32_t handle, const SvHandle *subId, uint32_t 
   const Status status = SessionNameToIndex(handle, subId, &index);
   if (status < 0) return status;
   return kvSetSubProperty(handle, static_cast<uint32_t>(index), id, source.size, source.buffer);
-}
-
-Status ReportMissingSetter(uint32_t line, uint32_t id, SvHandle *info) {
-  const Status status = ReportInternalError(kComponentKvsvapi, nFile::kSessionOpenClose, line, 0);
-  AnnotatePropertyStatus(status, id, info);
-  return status;
 }
 
 }  // namespace nKVSVAPI100

@@ -36,9 +36,6 @@ struct tSubPropertyIds {
 Status SetSessionPropertyValue(uint32_t handle, const SvHandle *subId, uint32_t id,
                                const tPropertySource &source, tSubPropertyIds subIds);
 
-// Setters that the family does not have: an internal report, annotated as any failure.
-Status ReportMissingSetter(uint32_t line, uint32_t id, SvHandle *info);
-
 }  // namespace nKVSVAPI100
 
 #endif

@@ -189,7 +189,7 @@ extern "C" KVSV_EXPORT kvsvStatus kvsvSessionGetPropTime(uint32_t session, uint3
 }
 extern "C" KVSV_EXPORT kvsvStatus kvsvSessionSetPropExTime(uint32_t, SvHandle *, uint32_t id,
                                                            const SvTime *, SvHandle *info) {
-  return ReportMissingSetter(kNoTimeSetterLine, id, info);
+  return ReportMissingSetter(nFile::kSessionOpenClose, kNoTimeSetterLine, id, info);
 }
 extern "C" KVSV_EXPORT kvsvStatus kvsvSessionSetPropTime(uint32_t session, uint32_t id,
                                                          const SvTime *value, SvHandle *info) {

@@ -13,8 +13,6 @@ using namespace nKVSVAPI100;
 namespace {
 
 constexpr uint32_t kStringSubIds[] = {kvPropSessionSub_J1939_AddrFilter};
-// A string handle holds its count and three spare bytes beyond the driver's size.
-constexpr uint32_t kStringSlack = 7;
 
 char *TextOf(SvHandle string) { return static_cast<char *>(*string) + kHostCountBytes; }
 

@@ -60,11 +60,8 @@ Status ReadStringArray(uint32_t handle, uint32_t &id, SvHandle *value, SvHandle 
     status = kvsvSessionGetPropString(handle, kvPropSession_ClusterName, &reference.handle, info);
     if (status < 0) return status;
   }
-  tMallocBlock text;
-  status = ReadTextBlock<tSessionPropertyCalls>(handle, id, text);
+  status = ReadCommaListProperty<tSessionPropertyCalls>(handle, id, value);
   if (status < 0) return status;
-  const Status split = CommaListToStringArray(text.get(), value, 0);
-  if (split < 0) return split;
   if (reference.handle != nullptr) {
     const Status appended = AppendReference(*value, reference.handle);
     if (appended < 0) return appended;
@@ -87,7 +84,7 @@ extern "C" KVSV_EXPORT kvsvStatus kvsvSessionGetPropString1D(uint32_t session, u
 
 extern "C" KVSV_EXPORT kvsvStatus kvsvSessionSetPropExString1D(uint32_t, SvHandle *, uint32_t id,
                                                                SvHandle *, SvHandle *info) {
-  return ReportMissingSetter(kNoStringArraySetterLine, id, info);
+  return ReportMissingSetter(nFile::kSessionOpenClose, kNoStringArraySetterLine, id, info);
 }
 extern "C" KVSV_EXPORT kvsvStatus kvsvSessionSetPropString1D(uint32_t session, uint32_t id,
                                                              SvHandle *value, SvHandle *info) {
