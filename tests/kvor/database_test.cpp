@@ -4,6 +4,7 @@
 // the quirks of other tools' files are read; what the reader has no use for is skipped and what
 // it knows is read and written back; a file is one database by any name until closed as often as
 // opened; objects of every class; aliases in their file; merges, deployments and attributes.
+#include <array>
 #include <filesystem>
 #include <fstream>
 #include <regex>
@@ -518,3 +519,159 @@ TEST_F(KvorDatabase, AttributesAreGivenByValueDefaultEnumerationAndName) {
 }
 
 }  // namespace
+
+// A small file whose every value is known, read by class and identifier as the text says; then
+// edited, saved and read back, with the PDUs and LIN schedules that only live in memory set on
+// the copy.
+const char kPropertyText[] =
+    "VERSION \"\"\n"
+    "BU_: Engine Dash\n"
+    "BO_ 291 Speed: 8 Engine\n"
+    " SG_ Mode M : 0|4@1+ (1,0) [0|15] \"\" Dash\n"
+    " SG_ Kmh m1 : 8|16@1+ (0.5,-10) [-10|1000] \"km/h\" Dash\n"
+    " SG_ Rpm : 39|16@0- (2,0) [0|8000] \"rpm\" Dash\n"
+    "BO_ 2147484000 Lamp: 4 Dash\n"
+    " SG_ On : 0|1@1+ (1,0) [0|1] \"\" Engine\n"
+    "CM_ SG_ 291 Kmh \"vehicle speed\";\n"
+    "BA_DEF_ BO_ \"GenMsgCycleTime\" INT 0 65535;\n"
+    "BA_ \"GenMsgCycleTime\" BO_ 291 100;\n";
+
+// One property as text: numbers, texts, the names of what references point at, lists with ','.
+std::string Shown(uint32_t object, uint32_t id) {
+  uint32_t size = 0;
+  if (const int32_t status = kvdbGetPropertySize(object, id, &size)) return std::to_string(status);
+  std::string numbers;
+  for (const uint32_t number : DbHandles(object, id)) numbers += std::to_string(number) + ",";
+  if (id >> 24 == 8) return numbers;
+  const std::string dump = Dump(object, {id}, false);
+  return dump.substr(dump.find('=') + 1);
+}
+
+TEST_F(KvorDatabase, EveryClassAnswersItsPropertiesAndEditsSurviveASaveAndALoad) {
+  const struct {
+    uint32_t objectClass;
+    const char *name;
+    uint32_t id;
+    const char *read, *edited;  // null: no such object then
+  } rows[] = {
+      {0x10000, "", kvPropClst_FrmRefs, "Speed,Lamp,", "Speed,Lamp,"},
+      {0x10000, "", kvPropClst_ApplicationProtocol, "0", "0"},
+      {0x20000, "Speed", kvPropFrm_ID, "291", "300"},
+      {0x20000, "Speed", kvPropFrm_CANTxTime, "0.1", "0.1"},
+      {0x20000, "Speed", kvPropFrm_CANTimingType, "0", "0"},
+      {0x20000, "Speed", kvPropFrm_SigRefs, "Speed.Mode,Speed.Kmh,Speed.Rpm,", "Speed.Mode,Speed.Kmh,Speed.Rpm,"},
+      {0x20000, "Speed", kvPropFrm_PDURefs, "Speed,", "Lamp,Speed,"},
+      {0x20000, "Speed", kvPropFrm_PDUStartBits, "0,", "0,32,"},
+      {0x20000, "Speed", kvPropFrm_PDUUpdateBits, "4294967295,", "63,4294967295,"},
+      {0x20000, "Lamp", kvPropFrm_ID, "352", "352"},
+      {0x20000, "Lamp", kvPropFrm_CANExtID, "1", "1"},
+      {0x20000, "Lamp", kvPropFrm_CANTimingType, "1", "1"},
+      {0x80000, "Lamp", kvPropPDU_FrmRefs, "Lamp,", "Speed,Lamp,"},
+      {0x80000, "Lamp", kvPropPDU_PayloadLen, "4", "4"},
+      {0x30000, "Speed.Kmh", kvPropSig_StartBit, "8", "8"},
+      {0x30000, "Speed.Kmh", kvPropSig_ScaleFac, "0.5", "0.25"},
+      {0x30000, "Speed.Kmh", kvPropSig_ScaleOff, "-10", "-10"},
+      {0x30000, "Speed.Kmh", kvPropSig_Max, "1000", "1000"},
+      {0x30000, "Speed.Kmh", kvPropSig_Unit, "km/h", "km/h"},
+      {0x30000, "Speed.Kmh", kvPropSig_Comment, "vehicle speed", "vehicle speed"},
+      {0x30000, "Speed.Kmh", kvPropSig_MuxSubfrmRef, "Speed.m1", "Speed.m1"},
+      {0x30000, "Speed.Rpm", kvPropSig_ByteOrdr, "1", "1"},
+      {0x30000, "Speed.Rpm", kvPropSig_DataType, "0", "0"},
+      {0x30000, "Speed.Mode", kvPropSig_MuxIsDataMux, "1", "1"},
+      {0x40000, "Speed.m1", kvPropSubfrm_DynSigRefs, "Speed.Kmh,", "Speed.Kmh,"},
+      {0x50000, "Engine", kvPropECU_TxFrmRefs, "Speed,", "Speed,Lamp,"},
+      {0x50000, "Engine", kvPropECU_RxFrmRefs, "Lamp,", ""},
+      {0x50000, "Dash", kvPropECU_TxFrmRefs, "Lamp,", ""},
+      {0x50000, "Dash", kvPropECU_J1939PreferredAddress, "254", "17"},
+      {0x60000, "Main", kvPropLINSched_Priority, nullptr, "3"},
+      {0x60000, "Main", kvPropLINSched_Entries, nullptr, "Main.Slot,"},
+      {0x70000, "Main.Slot", kvPropLINSchedEntry_Frames, nullptr, "Speed,Lamp,"},
+      {0x70000, "Main.Slot", kvPropLINSchedEntry_CollisionResSched, nullptr, "Spare"},
+      {0x70000, "Main.Slot", kvPropLINSchedEntry_Delay, nullptr, "0.01"},
+      {0x70000, "Main.Slot", kvPropLINSchedEntry_Type, nullptr, "2"},
+  };
+  uint32_t database = 0;
+  ASSERT_EQ(OpenText(kPropertyText, &database), 0) << DatabaseErrorText();
+  uint32_t cluster = DbCluster(database);
+  const auto find = [&](uint32_t objectClass, const char *name) {
+    uint32_t object = cluster;
+    if (objectClass != 0x10000) {
+      EXPECT_EQ(kvdbFindObject(cluster, objectClass, name, &object), 0) << name;
+    }
+    return object;
+  };
+  for (const auto &row : rows) {
+    if (row.read != nullptr) {
+      EXPECT_EQ(Shown(find(row.objectClass, row.name), row.id), row.read) << row.name << " " << std::hex << row.id;
+    }
+  }
+  const auto set = [&](uint32_t object, uint32_t id, auto value) {
+    EXPECT_EQ(kvdbSetProperty(object, id, sizeof value, &value), 0) << std::hex << id;
+  };
+  const uint32_t speed = find(0x20000, "Speed"), lamp = find(0x20000, "Lamp");
+  set(speed, kvPropFrm_ID, uint32_t{300});
+  set(find(0x30000, "Speed.Kmh"), kvPropSig_ScaleFac, 0.25);
+  set(find(0x50000, "Engine"), kvPropECU_TxFrmRefs, std::array<uint32_t, 2>{speed, lamp});
+  EXPECT_EQ(kvdbSetProperty(find(0x50000, "Engine"), kvPropECU_RxFrmRefs, 0, nullptr), 0);
+
+  database = SavedAndReloaded(database, "edited.dbc");
+  cluster = DbCluster(database);
+  set(find(0x50000, "Dash"), kvPropECU_J1939PreferredAddress, uint32_t{17});
+  set(find(0x20000, "Speed"), kvPropFrm_PDURefs,
+      std::array<uint32_t, 2>{find(0x80000, "Lamp"), find(0x80000, "Speed")});
+  set(find(0x20000, "Speed"), kvPropFrm_PDUStartBits, std::array<uint32_t, 2>{0, 32});
+  set(find(0x20000, "Speed"), kvPropFrm_PDUUpdateBits, std::array<uint32_t, 2>{63, 0xFFFFFFFF});
+  uint32_t main = 0, spare = 0, slot = 0;
+  ASSERT_EQ(kvdbCreateObject(cluster, 0x60000, "Main", &main) + kvdbCreateObject(cluster, 0x60000, "Spare", &spare) +
+                kvdbCreateObject(main, 0x70000, "Slot", &slot), 0);
+  set(main, kvPropLINSched_Priority, uint32_t{3});
+  set(slot, kvPropLINSchedEntry_Frames, std::array<uint32_t, 2>{find(0x20000, "Speed"), find(0x20000, "Lamp")});
+  set(slot, kvPropLINSchedEntry_CollisionResSched, spare);
+  set(slot, kvPropLINSchedEntry_Delay, 0.01);
+  set(slot, kvPropLINSchedEntry_Type, uint32_t{2});
+  for (const auto &row : rows) {
+    EXPECT_EQ(Shown(find(row.objectClass, row.name), row.id), row.edited) << row.name << " " << std::hex << row.id;
+  }
+}
+
+TEST_F(KvorDatabase, PropertiesAreRefusedWithTheStatusOfWhatIsWrong) {
+  uint32_t database = 0;
+  ASSERT_EQ(OpenText(kPropertyText, &database), 0) << DatabaseErrorText();
+  const uint32_t cluster = DbCluster(database);
+  const uint32_t speed = DbFind(cluster, 0x20000, "Speed"), kmh = DbFind(cluster, 0x30000, "Speed.Kmh");
+  const uint32_t engine = DbFind(cluster, 0x50000, "Engine");
+  uint32_t schedule = 0, entry = 0;
+  ASSERT_EQ(kvdbCreateObject(cluster, 0x60000, "Main", &schedule) + kvdbCreateObject(schedule, 0x70000, "Slot", &entry), 0);
+  const struct {
+    const char *what;
+    uint32_t object, id;
+    bool set;
+    uint32_t size;
+    uint64_t value;
+    int32_t status;
+  } rows[] = {
+      {"a number read into 8 bytes", speed, kvPropFrm_ID, false, 8, 0, kvsimErrPropertySize},
+      {"a list read into too few bytes", speed, kvPropFrm_SigRefs, false, 4, 0, kvsimErrBufferTooSmall},
+      {"a double set from 4 bytes", kmh, kvPropSig_ScaleFac, true, 4, 0, kvsimErrPropertySize},
+      {"a signal's property of a frame", speed, kvPropSig_StartBit, false, 4, 0, kvsimErrPropertyUnknown},
+      {"a LIN property of a CAN frame", speed, kvPropFrm_LINChecksum, false, 4, 0, kvsimErrWrongProtocol},
+      {"a collision schedule never set", entry, kvPropLINSchedEntry_CollisionResSched, false, 4, 0, kvsimErrPropertyUnknown},
+      {"a set of what follows from others", speed, kvPropFrm_SigRefs, true, 0, 0, kvsimErrPropertyReadOnly},
+      {"a standard identifier above 0x7FF", speed, kvPropFrm_ID, true, 4, 0x800, kvsimErrInvalidArgument},
+      {"a PDU start beyond the payload", speed, kvPropFrm_PDUStartBits, true, 4, 64, kvsimErrInvalidArgument},
+      {"an entry type above 3", entry, kvPropLINSchedEntry_Type, true, 4, 4, kvsimErrInvalidArgument},
+      {"a schedule priority of 255", schedule, kvPropLINSched_Priority, true, 4, 255, kvsimErrInvalidArgument},
+      {"a signal among sent frames", engine, kvPropECU_TxFrmRefs, true, 4, kmh, kvsimErrWrongObject},
+      {"a frame as a collision schedule", entry, kvPropLINSchedEntry_CollisionResSched, true, 4, speed, kvsimErrWrongObject},
+  };
+  for (const auto &row : rows) {
+    uint64_t value = row.value;
+    EXPECT_EQ(row.set ? kvdbSetProperty(row.object, row.id, row.size, &value)
+                      : kvdbGetProperty(row.object, row.id, row.size, &value),
+              row.status)
+        << row.what;
+  }
+  // A refused set changes nothing.
+  EXPECT_EQ(DbRead<uint32_t>(speed, kvPropFrm_ID), 291u);
+  EXPECT_EQ(DbHandles(engine, kvPropECU_TxFrmRefs), std::vector<uint32_t>{speed});
+}
