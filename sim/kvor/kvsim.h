@@ -266,8 +266,10 @@
  *                     (an update bit may also be 0xFFFFFFFF). An ECU's TxFrmRefs makes it the
  *                     transmitter of exactly those frames; its RxFrmRefs a receiver of each
  *                     signal of exactly those (a frame without signals:
- *                     kvsimErrInvalidArgument). A saved database keeps all but the PDUs,
- *                     J1939 values and LIN schedules, which a database file cannot hold.
+ *                     kvsimErrInvalidArgument). A saved database keeps all of these but the
+ *                     J1939NodeName and LIN schedules, which a database file cannot hold: a
+ *                     frame's PDUs are its attribute "PduMapping" ("names|start bits|update
+ *                     bits", lists cut by commas), an ECU's address "NmStationAddress".
  *                     Refusals: a property of another class, or one that the object has no
  *                     value for, kvsimErrPropertyUnknown; a read of a 4-, 8- or 1-byte type
  *                     with another size, or a set of such a type with another size or of an

@@ -8,6 +8,7 @@
 #include "kvorproperties.h"
 #include "kvsim.h"
 #include "property_value.h"
+#include "session_reference_properties.h"
 #include "signal_properties.h"
 
 namespace nKvorSim {
@@ -55,6 +56,9 @@ std::optional<PropertyValue> ReadOnlyProperty(const Session &session, uint32_t i
 std::optional<PropertyValue> PropertyOf(const Session &session, uint32_t id) {
   if (std::optional<PropertyValue> fixed = ReadOnlyProperty(session, id)) return fixed;
   if (std::optional<PropertyValue> stored = session.Store().Get(id)) return stored;
+  if (std::optional<PropertyValue> reference = ReferenceDefaultProperty(session, id)) {
+    return reference;
+  }
   if (std::optional<PropertyValue> frame = FrameDefaultProperty(session, id)) return frame;
   if (std::optional<PropertyValue> signal = SignalDefaultProperty(session, id)) return signal;
   return ConversionDefaultProperty(session, id);
@@ -86,8 +90,10 @@ Status GetSessionProperty(const Session &session, uint32_t id, uint32_t size, vo
 
 Status SetSessionProperty(Session &session, uint32_t id, uint32_t size, const void *value) {
   if (ReadOnlyProperty(session, id)) return kvsimErrPropertyReadOnly;
+  Status status = CheckReferenceProperty(session, id, size, value);
+  if (status < 0) return status;
   PropertyValue bytes;
-  const Status status = ValueFromCaller(id, size, value, &bytes);
+  status = ValueFromCaller(id, size, value, &bytes);
   if (status < 0) return status;
   session.Store().Set(id, std::move(bytes));
   return 0;
