@@ -847,19 +847,25 @@ KVSV_EXPORT kvsvStatus kvsvdbAutoCloseDbObject(uint32_t handle);
 /* The exports that the host calls by name to open (by the host string *name) and close a
  * reference of each class; they always return 0: a failed open gives an object that fails at its
  * first use. A close given a handle of another class closes it as that class. */
-#define KVSV_DB_REFERENCE_EXPORTS(openExport, closeExport)                                      \
-  KVSV_EXPORT kvsvStatus openExport(SvHandle *name, uint32_t *handleOut, uint64_t context);    \
-  KVSV_EXPORT kvsvStatus closeExport(uint32_t handle);
-KVSV_DB_REFERENCE_EXPORTS(kvsvdbDatabaseOpen, kvsvdbDatabaseClose)
-KVSV_DB_REFERENCE_EXPORTS(kvsvdbClusterOpen, kvsvdbClusterClose)
-KVSV_DB_REFERENCE_EXPORTS(kvsvdbFrameOpen, kvsvdbFrameClose)
-KVSV_DB_REFERENCE_EXPORTS(kvsvdbSignalOpen, kvsvdbSignalClose)
-KVSV_DB_REFERENCE_EXPORTS(kvsvdbSubframeOpen, kvsvdbSubframeClose)
-KVSV_DB_REFERENCE_EXPORTS(kvsvdbEcuOpen, kvsvdbEcuClose)
-KVSV_DB_REFERENCE_EXPORTS(kvsvdbLINSchedOpen, kvsvdbLINSchedClose)
-KVSV_DB_REFERENCE_EXPORTS(kvsvdbLINSchedEntryOpen, kvsvdbLINSchedEntryClose)
-KVSV_DB_REFERENCE_EXPORTS(kvsvdbPDUOpen, kvsvdbPDUClose)
-#undef KVSV_DB_REFERENCE_EXPORTS
+KVSV_EXPORT kvsvStatus kvsvdbDatabaseOpen(SvHandle *name, uint32_t *handleOut, uint64_t context);
+KVSV_EXPORT kvsvStatus kvsvdbDatabaseClose(uint32_t handle);
+KVSV_EXPORT kvsvStatus kvsvdbClusterOpen(SvHandle *name, uint32_t *handleOut, uint64_t context);
+KVSV_EXPORT kvsvStatus kvsvdbClusterClose(uint32_t handle);
+KVSV_EXPORT kvsvStatus kvsvdbFrameOpen(SvHandle *name, uint32_t *handleOut, uint64_t context);
+KVSV_EXPORT kvsvStatus kvsvdbFrameClose(uint32_t handle);
+KVSV_EXPORT kvsvStatus kvsvdbSignalOpen(SvHandle *name, uint32_t *handleOut, uint64_t context);
+KVSV_EXPORT kvsvStatus kvsvdbSignalClose(uint32_t handle);
+KVSV_EXPORT kvsvStatus kvsvdbSubframeOpen(SvHandle *name, uint32_t *handleOut, uint64_t context);
+KVSV_EXPORT kvsvStatus kvsvdbSubframeClose(uint32_t handle);
+KVSV_EXPORT kvsvStatus kvsvdbEcuOpen(SvHandle *name, uint32_t *handleOut, uint64_t context);
+KVSV_EXPORT kvsvStatus kvsvdbEcuClose(uint32_t handle);
+KVSV_EXPORT kvsvStatus kvsvdbLINSchedOpen(SvHandle *name, uint32_t *handleOut, uint64_t context);
+KVSV_EXPORT kvsvStatus kvsvdbLINSchedClose(uint32_t handle);
+KVSV_EXPORT kvsvStatus kvsvdbLINSchedEntryOpen(SvHandle *name, uint32_t *handleOut,
+                                               uint64_t context);
+KVSV_EXPORT kvsvStatus kvsvdbLINSchedEntryClose(uint32_t handle);
+KVSV_EXPORT kvsvStatus kvsvdbPDUOpen(SvHandle *name, uint32_t *handleOut, uint64_t context);
+KVSV_EXPORT kvsvStatus kvsvdbPDUClose(uint32_t handle);
 
 /* Creates an object of `objectClass` named `name` under `parent` and registers it with the host
  * under its reference text, into *reference. The host always gets a reference: when the create
