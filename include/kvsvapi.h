@@ -670,6 +670,64 @@ KVSV_EXPORT kvsvStatus kvsvSessionSetPropExString1D(uint32_t session, SvHandle *
 KVSV_EXPORT kvsvStatus kvsvSessionSetPropString1D(uint32_t session, uint32_t id, SvHandle *value,
                                                   SvHandle *info);
 
+/* References: what a property refers to, as the host holds it. A device is named "___kvorDev#" and
+ * the complement of its serial number in eight lower-case hex digits, an interface by its name, a
+ * database object by its reference text ("name\ndatabase.cluster", the cluster left out when it
+ * is named "Cluster").
+ * Get Ref: a text property (type 0x03) reads as the String form does; the interface's device
+ * (kvPropIntf_DevRef) as the device's name, empty if its serial cannot be read. Any other
+ * identifier is an internal error, 0xBFF63001. *value is replaced by a new string.
+ * Set Ref: kvPropSession_J1939ECU only (any other is an internal error), from the reference text
+ * of an ECU: 0xBFF63163 for a null or empty text, 0xBFF63164 for one without a database,
+ * 0xBFF63173 for a name with a dot, else the driver's status of the find or the write.
+ * Get Ref1D: a comma list (type 0x04) reads as the String1D form does; the device list of the
+ * system and the interface lists of the system and of a device as arrays of names. Any other
+ * identifier is an internal error. *value is replaced by a new array of strings, each its own; a
+ * list that is empty or cannot be read leaves *value as it was.
+ * Set Ref1D: a list of frames from an array of their reference texts; a null or empty array is
+ * written as empty. The first text that does not resolve ends the write, which then sends
+ * nothing. The host must not change the array during the call. */
+KVSV_EXPORT kvsvStatus kvsvSessionGetPropExRef(uint32_t session, SvHandle *subId, uint32_t id,
+                                               SvHandle *value, SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionGetPropRef(uint32_t session, uint32_t id, SvHandle *value,
+                                             SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionSetPropExRef(uint32_t session, SvHandle *subId, uint32_t id,
+                                               SvHandle *value, SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionSetPropRef(uint32_t session, uint32_t id, SvHandle *value,
+                                             SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionGetPropExRef1D(uint32_t session, SvHandle *subId, uint32_t id,
+                                                 SvHandle *value, SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionGetPropRef1D(uint32_t session, uint32_t id, SvHandle *value,
+                                               SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionSetPropExRef1D(uint32_t session, SvHandle *subId, uint32_t id,
+                                                 SvHandle *value, SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionSetPropRef1D(uint32_t session, uint32_t id, SvHandle *value,
+                                               SvHandle *info);
+
+/* Paths: a text property that names a file, as a host path (the host's SvPath). Get sets the text of *value, or
+ * makes the path into a null *value; a path the host cannot make is an internal error,
+ * 0xBFF63001. Set sends the path's text, "" for a null or empty path. Ex forms only. */
+KVSV_EXPORT kvsvStatus kvsvSessionGetPropExPath(uint32_t session, SvHandle *subId, uint32_t id,
+                                                struct SvPathRecord **value, SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionSetPropExPath(uint32_t session, SvHandle *subId, uint32_t id,
+                                                struct SvPathRecord **value, SvHandle *info);
+
+/* The Ethernet receive filter (kvPropSession_IntfEnetEptReceiveFilter only; any other identifier
+ * is an internal error, 0xBFF63001): a host array, count at byte 0, from byte 8 elements of 16
+ * bytes: a boolean at 0 with the 16-bit value at 2, a boolean at 4 with the 8-bit value at 5, a
+ * boolean at 6 with the filter name, a string handle, at 8. Each boolean says whether its field is
+ * in force.
+ * Get replaces *value, its names disposed of, with a new array and new names; a failed read
+ * leaves it as it was.
+ * Set: a null or empty array writes nothing and returns 0. A name of more than 18 characters
+ * fails the whole write with 0xBFF630C0 and nothing is sent. Ex forms only. */
+KVSV_EXPORT kvsvStatus kvsvSessionGetPropExCluster1D(uint32_t session, SvHandle *subId,
+                                                     uint32_t id, SvHandle *value,
+                                                     SvHandle *info);
+KVSV_EXPORT kvsvStatus kvsvSessionSetPropExCluster1D(uint32_t session, SvHandle *subId,
+                                                     uint32_t id, SvHandle *value,
+                                                     SvHandle *info);
+
 /* ---- State writes and triggers ------------------------------------------------------------ */
 
 /* Selects the LIN schedule of `session` by the host string *schedule. A null or empty string is

@@ -6,6 +6,7 @@
 
 #include "core/host_handles.h"
 #include "kvorproperties.h"
+#include "session/device_reference_name.h"
 #include "session/kvorutility.h"
 #include "session/object_class.h"
 
@@ -18,9 +19,6 @@ namespace {
 constexpr std::size_t kMapBuckets = 16;
 constexpr float kMapMaxLoad = 1.0f;
 
-// The host names a device by its serial number, which does not change as its model name may: the
-// complement of the serial in eight hex digits behind this prefix.
-constexpr char kDeviceNamePrefix[] = "___kvorDev#";
 constexpr uint64_t kDeviceNameSize = 20;  // the prefix and eight hex digits, before it grows
 
 // Interfaces of this protocol also answer to "<name>/monitor", with the same reference.
@@ -60,13 +58,7 @@ Status ReadReferences(uint32_t system, uint32_t refsProperty, cSearchScope &scop
 Status ReadDeviceName(uint32_t device, SvHandle &name) {
   ReplaceScratchHandle(&name, kDeviceNameSize);
   if (name == nullptr || *name == nullptr) return kvErrOutOfMemory;
-  uint32_t serial = 0;
-  const Status read = kvGetProperty(device, kvPropDev_SerNum, sizeof serial, &serial);
-  if (read < 0) return read;
-  if (svStrPrintf(name, "%s%08lx", kDeviceNamePrefix,
-                  static_cast<unsigned long>(static_cast<uint32_t>(~serial))) < 0)
-    return kvErrOutOfMemory;
-  return read;
+  return ReadDeviceReferenceName(device, name);
 }
 
 // The driver's name counts its terminating NUL; the counted text does not.
