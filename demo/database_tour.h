@@ -17,12 +17,12 @@ struct tDatabaseTour {
   std::string failedCall;
   int32_t status = 0;
 
-  std::string frameReference;   // of the frame found by its reference text
-  std::string signalReference;  // of the signal found by its reference text
+  std::string frameReference;              // of the frame found by its reference text
+  std::string signalReference;             // of the signal found by its reference text
   std::vector<std::string> clusterFrames;  // the cluster's frames, by reference
-  std::string scheduleReference;  // of the LIN schedule created and deleted
+  std::string scheduleReference;           // of the LIN schedule created and deleted
   std::string savedPath;
-  bool addedFrameReloaded = false;  // the frame added is in the saved file, opened anew
+  bool addedFrameReloaded = false;   // the frame added is in the saved file, opened anew
   std::vector<std::string> aliases;  // the database list, with the file of each
   std::vector<std::string> aliasFiles;
   uint32_t openDatabasesAtEnd = 0;

@@ -1,6 +1,8 @@
 # The drive of kvsv-demo as a library of its own, so that the tests run it in every build tree,
 # with or without the demonstration program.
 add_library(kvsv_drive STATIC
+  ${CMAKE_CURRENT_LIST_DIR}/database_calls.cpp
+  ${CMAKE_CURRENT_LIST_DIR}/database_property_tour.cpp
   ${CMAKE_CURRENT_LIST_DIR}/database_tour.cpp
   ${CMAKE_CURRENT_LIST_DIR}/drive_scenario.cpp
   ${CMAKE_CURRENT_LIST_DIR}/drive_signals.cpp

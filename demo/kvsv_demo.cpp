@@ -12,6 +12,7 @@
 #include <fstream>
 #include <string>
 
+#include "database_property_tour.h"
 #include "database_tour.h"
 #include "drive_scenario.h"
 #include "library_exports.h"
@@ -42,8 +43,8 @@ void PrintSessions(const tDriveResult &r) {
   std::printf("\nSessions opened by name:\n  %-28s %-10s %5s %s\n", "name", "interface", "mode",
               "items");
   for (const tSessionSummary &s : r.sessions) {
-    std::printf("  %-28s %-10s %5" PRIu32 " %" PRIu32 "\n", s.name.c_str(),
-                s.interfaceName.c_str(), s.mode, s.numInList);
+    std::printf("  %-28s %-10s %5" PRIu32 " %" PRIu32 "\n", s.name.c_str(), s.interfaceName.c_str(),
+                s.mode, s.numInList);
   }
 }
 
@@ -122,6 +123,33 @@ bool PrintDatabaseTour(const tDatabaseTour &t) {
   return t.addedFrameReloaded && t.openDatabasesAtEnd == 0;
 }
 
+bool PrintPropertyTour(const tPropertyTour &t, const std::string &frame) {
+  std::printf("\nSignals of %s read as database properties (as the file writes them):\n",
+              frame.c_str());
+  if (t.status < 0) {
+    std::fprintf(stderr, "%s failed: status 0x%08" PRIX32 "\n", t.failedCall.c_str(),
+                 static_cast<uint32_t>(t.status));
+    return false;
+  }
+  for (const tSignalRow &row : t.signals) {
+    std::printf("  SG_ %-24s : %s\n", row.name.c_str(), row.AsFileText().c_str());
+  }
+  std::printf("  factor of %s set from %g to %g, saved, reloaded: %g\n",
+              t.signals.empty() ? "-" : t.signals.front().name.c_str(), t.factorBefore, t.factorSet,
+              t.factorReloaded);
+  const auto bit = [](uint32_t b) {
+    return b == UINT32_MAX ? std::string("none") : std::to_string(b);
+  };
+  for (size_t i = 0; i < t.mappingBefore.size() && i < t.mappingAfter.size(); ++i) {
+    std::printf("  PDU mapping of the frame: %s at start bit %" PRIu32
+                ", update bit %s, written and read back as %s\n",
+                OneLine(t.mappingBefore[i].pdu).c_str(), t.mappingBefore[i].startBit,
+                bit(t.mappingBefore[i].updateBit).c_str(),
+                bit(t.mappingAfter[i].updateBit).c_str());
+  }
+  return !t.signals.empty() && t.factorReloaded == t.factorSet && !t.mappingAfter.empty();
+}
+
 bool WritePicture(const tDriveResult &r, const std::string &directory) {
   std::vector<tPlotCurve> curves;
   for (size_t i = 0; i < r.waveforms.size() && i < 2; ++i) {
@@ -180,10 +208,9 @@ int main(int argc, char **argv) {
   std::printf("Drive on %s with %s\n", options.interfaceName.c_str(), options.dbcPath.c_str());
   const tDriveResult result = RunDrive(exports, options);
   if (result.status < 0) {
-    std::fprintf(stderr, "%s failed: status 0x%08" PRIX32 " (%s)%s%s\n",
-                 result.failedCall.c_str(), static_cast<uint32_t>(result.status),
-                 result.statusText.c_str(), result.failedProperty.empty() ? "" : ", property ",
-                 result.failedProperty.c_str());
+    std::fprintf(stderr, "%s failed: status 0x%08" PRIX32 " (%s)%s%s\n", result.failedCall.c_str(),
+                 static_cast<uint32_t>(result.status), result.statusText.c_str(),
+                 result.failedProperty.empty() ? "" : ", property ", result.failedProperty.c_str());
     return 1;
   }
   PrintSessions(result);
@@ -194,5 +221,10 @@ int main(int argc, char **argv) {
   const tDatabaseTour tour =
       RunDatabaseTour(exports, KVSV_DEMO_DBC, std::filesystem::absolute(outDirectory).string(),
                       "DAS_control", "DAS_setSpeed");
-  return PrintDatabaseTour(tour) && pictured ? 0 : 1;
+  const bool toured = PrintDatabaseTour(tour);
+  const std::string frame = "DAS_control";
+  const tPropertyTour properties = RunPropertyTour(
+      exports, KVSV_DEMO_DBC, std::filesystem::absolute(outDirectory).string(), frame);
+  const bool read = PrintPropertyTour(properties, frame);
+  return toured && read && pictured ? 0 : 1;
 }

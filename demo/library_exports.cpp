@@ -38,6 +38,12 @@ tLibraryExports ExportsOf(void *library, std::string &error) {
   Find(library, "kvsvdbSave", e.dbSave, error);
   Find(library, "kvsvdbGetDatabaseList", e.dbGetDatabaseList, error);
   Find(library, "kvsvGetNumOpenDatabases", e.dbNumOpen, error);
+  Find(library, "kvsvdbGetPropU32", e.dbGetPropU32, error);
+  Find(library, "kvsvdbGetPropF64", e.dbGetPropF64, error);
+  Find(library, "kvsvdbSetPropF64", e.dbSetPropF64, error);
+  Find(library, "kvsvdbGetPropString", e.dbGetPropString, error);
+  Find(library, "kvsvdbGetPropPDU_Mapping", e.dbGetPropPDU_Mapping, error);
+  Find(library, "kvsvdbSetPropPDU_Mapping", e.dbSetPropPDU_Mapping, error);
   return e;
 }
 

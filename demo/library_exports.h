@@ -32,6 +32,12 @@ struct tLibraryExports {
   decltype(&kvsvdbSave) dbSave = nullptr;
   decltype(&kvsvdbGetDatabaseList) dbGetDatabaseList = nullptr;
   decltype(&kvsvGetNumOpenDatabases) dbNumOpen = nullptr;
+  decltype(&kvsvdbGetPropU32) dbGetPropU32 = nullptr;
+  decltype(&kvsvdbGetPropF64) dbGetPropF64 = nullptr;
+  decltype(&kvsvdbSetPropF64) dbSetPropF64 = nullptr;
+  decltype(&kvsvdbGetPropString) dbGetPropString = nullptr;
+  decltype(&kvsvdbGetPropPDU_Mapping) dbGetPropPDU_Mapping = nullptr;
+  decltype(&kvsvdbSetPropPDU_Mapping) dbSetPropPDU_Mapping = nullptr;
 };
 
 // The exports of the library this program was linked with.

@@ -27,6 +27,12 @@ tLibraryExports LinkedExports() {
   e.dbSave = &kvsvdbSave;
   e.dbGetDatabaseList = &kvsvdbGetDatabaseList;
   e.dbNumOpen = &kvsvGetNumOpenDatabases;
+  e.dbGetPropU32 = &kvsvdbGetPropU32;
+  e.dbGetPropF64 = &kvsvdbGetPropF64;
+  e.dbSetPropF64 = &kvsvdbSetPropF64;
+  e.dbGetPropString = &kvsvdbGetPropString;
+  e.dbGetPropPDU_Mapping = &kvsvdbGetPropPDU_Mapping;
+  e.dbSetPropPDU_Mapping = &kvsvdbSetPropPDU_Mapping;
   return e;
 }
 

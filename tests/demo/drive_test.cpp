@@ -10,10 +10,12 @@
 #include <fstream>
 #include <functional>
 #include <regex>
+#include <sstream>
 #include <string>
 #include <tuple>
 #include <vector>
 
+#include "database_property_tour.h"
 #include "database_tour.h"
 #include "drive_scenario.h"
 #include "kvsim.h"
@@ -250,6 +252,36 @@ TEST(DatabaseTour, EditsSavesAndReloadsThroughTheExportsAndLeavesNothingOpen) {
   EXPECT_EQ(t.aliasFiles.size(), 2u);
   EXPECT_EQ(std::make_tuple(t.openDatabasesAtEnd, kvsimLoadedDatabaseCount(), svsimRefCount()),
             std::make_tuple(0u, 0, 0));
+}
+
+// The property tour on a real file: every signal of the frame reads as the file's own line, a
+// changed factor is in the saved file, and a PDU mapping written is read back.
+TEST(DatabaseTour, ReadsSignalsAsTheFileWritesThemAndKeepsWhatItChanges) {
+  const kvsvtest::cTempDir directory;
+  const kvsvtest::cScopedEnv config("KVSIM_CONFIG_DIR", directory.Sub("config"));
+  kvsimReset();
+  const std::string dbc = KVSV_DBC_DIR "/tesla_can.dbc";
+  const tPropertyTour t = RunPropertyTour(LinkedExports(), dbc, directory.Path(), "DAS_control");
+  ASSERT_EQ(t.status, 0) << t.failedCall;
+
+  const std::string text = kvsvtest::ReadFile(dbc);
+  const size_t frame = text.find("BO_ 697 DAS_control:");
+  const std::regex signalLine(R"re(^ SG_ (\w+) : (.*) \w+$)re");
+  std::vector<std::string> expected, read;
+  std::istringstream lines(text.substr(text.find('\n', frame) + 1));
+  std::smatch m;
+  for (std::string line; std::getline(lines, line) && std::regex_match(line, m, signalLine);)
+    expected.push_back(m[1].str() + " " + m[2].str());
+  for (const tSignalRow &row : t.signals) read.push_back(row.name + " " + row.AsFileText());
+  EXPECT_EQ(read, expected);
+  EXPECT_EQ(t.factorReloaded, t.factorSet);
+  EXPECT_NE(t.factorSet, t.factorBefore);
+  ASSERT_EQ(t.mappingBefore.size(), 1u);
+  ASSERT_EQ(t.mappingAfter.size(), 1u);
+  EXPECT_EQ(t.mappingAfter[0].pdu, t.mappingBefore[0].pdu);
+  EXPECT_EQ(std::make_pair(t.mappingAfter[0].startBit, t.mappingAfter[0].updateBit),
+            std::make_pair(t.mappingBefore[0].startBit, 63u));
+  EXPECT_EQ(std::make_tuple(kvsimLoadedDatabaseCount(), svsimRefCount()), std::make_tuple(0, 0));
 }
 
 // The points of each polyline of `svg`.
