@@ -46,8 +46,8 @@ uint32_t NameOfListed(uint32_t id) {
 
 // Names the objects of `id` with `nameId`; an unknown `nameId` (0) is reported first, and the
 // report's status ends the read unless it is not an error.
-Status ReadSystemRefs(uint32_t handle, uint32_t id, uint32_t nameId, uint32_t line,
-                      SvHandle *value, uint32_t mode) {
+Status ReadSystemRefs(uint32_t handle, uint32_t id, uint32_t nameId, uint32_t line, SvHandle *value,
+                      uint32_t mode) {
   if (nameId == 0) {
     const Status reported =
         ReportInternalError(kComponentKvsvapi, nFile::kSessionOpenClose, line, id);
@@ -61,8 +61,8 @@ Status ReadSystemRefs(uint32_t handle, uint32_t id, uint32_t nameId, uint32_t li
 // again: the driver keeps the ECU for the session.
 Status WriteEcu(uint32_t session, uint32_t id, const SvHandle *value) {
   uint32_t database = 0, ecu = 0;
-  const Status found = FindDbObjectByReferenceString(value != nullptr ? *value : nullptr,
-                                                     kClassEcu, &database, &ecu);
+  const Status found = FindDbObjectByReferenceString(value != nullptr ? *value : nullptr, kClassEcu,
+                                                     &database, &ecu);
   if (found < 0) return found;
   const Status set = tSessionPropertyCalls::Set(session, id, sizeof ecu, &ecu);
   const Status closed = kvdbCloseDatabase(database, 0);
@@ -98,9 +98,8 @@ Status WriteFrames(uint32_t handle, uint32_t id, const SvHandle *value) {
 
 }  // namespace
 
-extern "C" KVSV_EXPORT kvsvStatus kvsvSessionGetPropExRef(uint32_t session, SvHandle *,
-                                                          uint32_t id, SvHandle *value,
-                                                          SvHandle *info) {
+extern "C" KVSV_EXPORT kvsvStatus kvsvSessionGetPropExRef(uint32_t session, SvHandle *, uint32_t id,
+                                                          SvHandle *value, SvHandle *info) {
   const uint32_t handle = RedirectSystemHandle(session, id);
   // A text is a name already, annotated by the string read itself.
   if (IsText(id)) return kvsvSessionGetPropString(handle, id, value, info);
@@ -113,9 +112,8 @@ extern "C" KVSV_EXPORT kvsvStatus kvsvSessionGetPropRef(uint32_t session, uint32
   return kvsvSessionGetPropExRef(session, nullptr, id, value, info);
 }
 
-extern "C" KVSV_EXPORT kvsvStatus kvsvSessionSetPropExRef(uint32_t session, SvHandle *,
-                                                          uint32_t id, SvHandle *value,
-                                                          SvHandle *info) {
+extern "C" KVSV_EXPORT kvsvStatus kvsvSessionSetPropExRef(uint32_t session, SvHandle *, uint32_t id,
+                                                          SvHandle *value, SvHandle *info) {
   if (id != kvPropSession_J1939ECU)
     return ReportMissingSetter(nFile::kSessionOpenClose, kLineSetRefUnknown, id, info);
   return AnnotatedStatus(WriteEcu(session, id, value), id, info);
@@ -131,8 +129,8 @@ extern "C" KVSV_EXPORT kvsvStatus kvsvSessionGetPropExRef1D(uint32_t session, Sv
   const uint32_t handle = RedirectSystemHandle(session, id);
   if (IsCommaList(id)) return kvsvSessionGetPropString1D(handle, id, value, info);
   return AnnotatedStatus(
-      ReadSystemRefs(handle, id, NameOfListed(id), kLineRef1DUnknown, value, kSystemRefsArray),
-      id, info);
+      ReadSystemRefs(handle, id, NameOfListed(id), kLineRef1DUnknown, value, kSystemRefsArray), id,
+      info);
 }
 extern "C" KVSV_EXPORT kvsvStatus kvsvSessionGetPropRef1D(uint32_t session, uint32_t id,
                                                           SvHandle *value, SvHandle *info) {

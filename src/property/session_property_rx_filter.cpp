@@ -35,8 +35,10 @@ tEnetRxFilterCluster *Elements(SvHandle array) {
 void DisposeFilterArray(SvHandle *array) {
   if (*array == nullptr) return;
   if (**array != nullptr) {
-    const uint64_t room = (svGetHandleSize(*array) - kEnetRxFilterArrayHeader) /
-                          sizeof(tEnetRxFilterCluster);
+    const uint64_t size = svGetHandleSize(*array);
+    const uint64_t room = size > kEnetRxFilterArrayHeader
+                              ? (size - kEnetRxFilterArrayHeader) / sizeof(tEnetRxFilterCluster)
+                              : 0;
     const int32_t count = ArrayCount(*array);
     const uint64_t held = count > 0 ? std::min<uint64_t>(static_cast<uint64_t>(count), room) : 0;
     for (uint64_t i = 0; i < held; ++i) DisposeHandle(&Elements(*array)[i].filterName);
@@ -76,8 +78,8 @@ Status ReadFilter(uint32_t handle, uint32_t id, SvHandle *value) {
     if (status < 0) return status;
   }
   DisposeFilterArray(value);
-  *value = svNewHandleClr(uint64_t{count} * sizeof(tEnetRxFilterCluster) +
-                          kEnetRxFilterArrayHeader);
+  *value =
+      svNewHandleClr(uint64_t{count} * sizeof(tEnetRxFilterCluster) + kEnetRxFilterArrayHeader);
   if (*value == nullptr) return kvErrOutOfMemory;
   ArrayCount(*value) = 0;
   for (uint32_t i = 0; i < count; ++i) {

@@ -1,7 +1,8 @@
 // Property names and the error information they go into, list entries named by index or name, and
 // the session property exports against the driver stand-in, one table per shape of value: the
 // bytes each shape sends and reads, the size protocol of arrays and strings, lists of objects in
-// their modes, sub-indexed writes, the system handle kept across a reopen, host refusals.
+// their modes, sub-indexed writes, the system handle kept across a reopen, host refusals; objects
+// as the host names them, paths and the Ethernet receive filter.
 #include <gtest/gtest.h>
 
 #include <cstring>
@@ -12,6 +13,7 @@
 
 #include "core/host_handles.h"
 #include "property/annotate_property_status.h"
+#include "property/enet_rx_filter_record.h"
 #include "property/property_id_names.h"
 #include "property/session_name_to_index.h"
 #include "session/kvorutility.h"
@@ -450,6 +452,212 @@ TEST_F(PropertyTest, TheHiddenSwitchTheSystemHandleAndHostRefusals) {
     EXPECT_EQ(get(session, nullptr, id, &value, &info_), kvErrOutOfMemory);
     EXPECT_NE(Annotation().find("\nProperty: "), std::string::npos);
   }
+}
+
+// The driver's handles of one kind, listed by `list` of `object`.
+std::vector<uint32_t> Handles(uint32_t object, uint32_t list) {
+  uint32_t size = 0;
+  EXPECT_EQ(kvGetPropertySize(object, list, &size), 0);
+  std::vector<uint32_t> handles(size / 4);
+  EXPECT_EQ(kvGetProperty(object, list, size, handles.data()), 0);
+  return handles;
+}
+
+// Objects named as the host holds them: devices by serial, interfaces by name, texts and comma
+// lists as their own forms; a serial that cannot be read; identifiers the shapes do not serve.
+TEST_F(PropertyTest, SystemObjectsComeAsTheNamesTheHostHoldsThemBy) {
+  uint32_t system = 0;
+  ASSERT_EQ(kvSystemOpen(&system), 0);
+  const uint32_t device2 = Handles(system, kvPropSys_DevRefs)[1];
+  const uint32_t enet = Handles(device2, kvPropDev_IntfRefs)[2];
+  const uint32_t session = Session("A");
+  ASSERT_EQ(kvSetProperty(session, kvPropSession_IntfEnetStatsCounterNames, 6, "rx,tx"), 0);
+  using tNames = std::vector<std::string>;
+  const struct {
+    bool array;
+    uint32_t object, id;
+    bool failSerial;
+    Status status;
+    tNames names;  // {"old"}: what the host held stays
+  } cases[] = {
+      {false, session, kvPropSession_IntfName, false, 0, {"CAN1"}},
+      {false, enet, kvPropIntf_DevRef, false, 0, {"___kvorDev#fff0b8ec"}},
+      {false, enet, kvPropIntf_DevRef, true, kvsimErrInternal, {""}},
+      {true, system, kvPropSys_DevRefs, false, 0, {"___kvorDev#fff0b8ed", "___kvorDev#fff0b8ec"}},
+      // The device behind one without a serial is nameless too.
+      {true, system, kvPropSys_DevRefs, true, 0, {"", ""}},
+      {true, system, kvPropSys_IntfRefsLIN, false, 0, {"LIN1", "LIN2"}},
+      {true, device2, kvPropDev_IntfRefs, false, 0, {"FlexRay1", "FlexRay2", "ENET1"}},
+      {true, session, kvPropSession_IntfEnetStatsCounterNames, false, 0, {"rx", "tx"}},
+      {false, session, kvPropSession_J1939ECU, false, kvErrInternal, {"old"}},
+      {true, session, kvPropSession_IntfOutStrmList, false, kvErrInternal, {"old"}},
+  };
+  for (const auto &c : cases) {
+    SCOPED_TRACE(testing::Message() << std::hex << c.id << (c.failSerial ? " no serial" : ""));
+    if (c.failSerial) kvsimFailProperty("kvGetProperty", kvPropDev_SerNum, kvsimErrInternal, 1);
+    SvHandle value = svsimMakeString("old");
+    if (c.array) {
+      value = nullptr;
+      ASSERT_EQ(CommaListToStringArray(std::vector<char>{'o', 'l', 'd', '\0'}.data(), &value, 0),
+                0);
+    }
+    const auto get = c.array ? kvsvSessionGetPropRef1D : kvsvSessionGetPropRef;
+    EXPECT_EQ(get(c.object, c.id, &value, &info_), c.status);
+    EXPECT_EQ(c.array ? ReadStringArray(value) : tNames{Text(value)}, c.names);
+    if (c.array)
+      DisposeHandleArray(&value);
+    else
+      svDisposeHandle(value);
+    if (c.status != 0) {
+      EXPECT_NE(Annotation(), "");
+    }
+  }
+  kvSystemClose(system);
+}
+
+// The J1939 ECU and a list of frames from their reference texts: the handles the driver gets, the
+// databases opened to find them all closed again, and texts that do not resolve.
+TEST_F(PropertyTest, DatabaseObjectsAreWrittenFromTheirReferenceTexts) {
+  uint32_t database = 0, cluster = 0, gear = 0, speed = 0, dash = 0;
+  ASSERT_EQ(kvdbOpenDatabase(":memory:", &database), 0);
+  ASSERT_EQ(kvdbCreateObject(database, 0x10000, "Body", &cluster), 0);
+  ASSERT_EQ(kvdbCreateObject(cluster, 0x20000, "Gear", &gear), 0);
+  ASSERT_EQ(kvdbCreateObject(cluster, 0x20000, "Speed", &speed), 0);
+  ASSERT_EQ(kvdbCreateObject(cluster, 0x50000, "Dash", &dash), 0);
+  const uint32_t session = Session("A");
+  const uint32_t ecuId = kvPropSession_J1939ECU, framesId = kvPropSession_IntfOutStrmList;
+  const struct {
+    uint32_t id;
+    std::vector<const char *> texts;
+    Status status;
+    std::vector<uint32_t> sent;  // empty: nothing sent
+  } cases[] = {
+      {ecuId, {"Dash\n:memory:.Body"}, 0, {dash}},
+      {ecuId, {""}, kvErrDbReferenceEmpty, {}},
+      {ecuId, {"Da.sh\n:memory:.Body"}, kvErrDbReferenceTooDeep, {}},
+      {ecuId, {"Gear\n:memory:.Body"}, kvsimErrObjectNotFound, {}},
+      {kvPropSession_IntfName, {"Dash\n:memory:.Body"}, kvErrInternal, {}},
+      {framesId, {"Speed\n:memory:.Body", "Gear  :memory:.Body"}, 0, {speed, gear}},
+      {framesId,
+       {"Gear\n:memory:.Body", "Dash\n:memory:.Body", "Speed\n:memory:.Body"},
+       kvsimErrObjectNotFound,
+       {}},
+  };
+  for (const auto &c : cases) {
+    SCOPED_TRACE(c.texts[0]);
+    kvsimLogClear();
+    SvHandle value = nullptr;
+    Status status = 0;
+    if (c.id == framesId) {
+      value = svNewHandleClr(8 + 8 * c.texts.size());
+      ArrayCount(value) = static_cast<int32_t>(c.texts.size());
+      for (size_t i = 0; i < c.texts.size(); ++i)
+        ArrayData8<SvHandle>(value)[i] = svsimMakeString(c.texts[i]);
+      status = kvsvSessionSetPropRef1D(session, c.id, &value, &info_);
+      DisposeHandleArray(&value);
+    } else {
+      value = svsimMakeString(c.texts[0]);
+      status = kvsvSessionSetPropRef(session, c.id, &value, &info_);
+      svDisposeHandle(value);
+    }
+    EXPECT_EQ(status, c.status);
+    if (c.status != 0) {
+      EXPECT_NE(Annotation(), "");
+    }
+    EXPECT_EQ(kvsimCountCalls("kvSetProperty"), c.sent.empty() ? 0 : 1);
+    if (!c.sent.empty()) {
+      EXPECT_EQ(Handles(session, c.id), c.sent);
+    }
+    EXPECT_EQ(kvsimCountCalls("kvdbCloseDatabase"), kvsimCountCalls("kvdbOpenDatabase"));
+  }
+  // An empty list is written as empty.
+  SvHandle none = nullptr;
+  ASSERT_EQ(kvsvSessionSetPropRef1D(session, framesId, &none, &info_), 0);
+  EXPECT_EQ(LastCall("kvSetProperty").size1, 0u);
+  kvdbCloseDatabase(database, 0);
+}
+
+TEST_F(PropertyTest, PathsTravelAsTheirText) {
+  const uint32_t session = Session("A");
+  const uint32_t id = kvPropSession_EnetLogFile;
+  SvHandle text = Keep(svsimMakeString("/var/log/enet.pcap"));
+  SvPath written = nullptr, read = nullptr;
+  ASSERT_EQ(svStringToPath(text, &written), 0);
+  ASSERT_EQ(kvsvSessionSetPropExPath(session, nullptr, id, &written, &info_), 0);
+  EXPECT_EQ(LastCall("kvSetProperty").size1, 19u);
+  ASSERT_EQ(kvsvSessionGetPropExPath(session, nullptr, id, &read, &info_), 0);
+  SvHandle back = nullptr;
+  ASSERT_EQ(svPathToString(read, &back), 0);
+  EXPECT_EQ(Text(Keep(back)), "/var/log/enet.pcap");
+  // No path is the empty text; a failed read leaves the host's path.
+  SvPath none = nullptr;
+  ASSERT_EQ(kvsvSessionSetPropExPath(session, nullptr, id, &none, &info_), 0);
+  EXPECT_EQ(LastCall("kvSetProperty").size1, 1u);
+  kvsimFailProperty("kvGetProperty", id, kvsimErrInternal, 1);
+  EXPECT_EQ(kvsvSessionGetPropExPath(session, nullptr, id, &read, &info_), kvsimErrInternal);
+  EXPECT_EQ(Annotation(), "\nProperty: EnetLogFile");
+  ASSERT_EQ(svPathToString(read, &back), 0);
+  EXPECT_EQ(Text(back), "/var/log/enet.pcap");
+  svDestroyPath(written);
+  svDestroyPath(read);
+}
+
+// Each flag bit alone and names about the driver's limit, as the driver gets them and as they come
+// back.
+TEST_F(PropertyTest, TheReceiveFilterKeepsEachFieldAndRefusesLongNames) {
+  const uint32_t session = MakeSession("", 7, "ENET1");
+  const uint32_t id = kvPropSession_IntfEnetEptReceiveFilter;
+  const struct {
+    uint8_t use16, use8, useName;
+    size_t nameLength;
+    Status status;
+    uint32_t flags;
+  } cases[] = {
+      {1, 0, 0, 0, 0, 1},
+      {0, 7, 0, 0, 0, 2},
+      {0, 0, 1, 18, 0, 4},
+      {0, 0, 0, 19, kvErrNameTooLong, 0},
+      {0, 0, 1, 20, kvErrNameTooLong, 0},
+      {0, 0, 1, 21, kvErrNameTooLong, 0},
+      {1, 1, 1, 40, kvErrNameTooLong, 0},
+  };
+  for (const auto &c : cases) {
+    SCOPED_TRACE(testing::Message() << "flags " << c.flags << " name " << c.nameLength);
+    const std::string name(c.nameLength, 'n');
+    SvHandle array = Keep(svNewHandleClr(8 + 2 * 16)), read = nullptr;
+    ArrayCount(array) = 2;  // the second element empty
+    auto *element = reinterpret_cast<tEnetRxFilterCluster *>(static_cast<char *>(*array) + 8);
+    element->useValue16 = c.use16, element->useValue8 = c.use8, element->useName = c.useName;
+    element->value16 = 0xBEEF, element->value8 = 0x5A;
+    element->filterName = Keep(svsimMakeString(name.c_str()));
+    kvsimLogClear();
+    EXPECT_EQ(kvsvSessionSetPropExCluster1D(session, nullptr, id, &array, &info_), c.status);
+    if (c.status != 0) {
+      EXPECT_EQ(kvsimCountCalls("kvSetProperty"), 0);
+      EXPECT_EQ(Annotation(), "\nProperty: IntfEnetEptReceiveFilter");
+      continue;
+    }
+    tEnetRxFilterRecord records[2];
+    ASSERT_EQ(kvGetProperty(session, id, sizeof records, records), 0);
+    EXPECT_EQ(std::make_tuple(records[0].flags, records[0].value16, records[0].value8,
+                              std::string(records[0].filterName), records[1].flags),
+              std::make_tuple(c.flags, uint16_t{0xBEEF}, uint8_t{0x5A}, name, 0u));
+    ASSERT_EQ(kvsvSessionGetPropExCluster1D(session, nullptr, id, &read, &info_), 0);
+    const auto *back = reinterpret_cast<tEnetRxFilterCluster *>(static_cast<char *>(*read) + 8);
+    EXPECT_EQ(ArrayCount(read), 2);
+    EXPECT_EQ(std::make_tuple(back->useValue16, back->useValue8, back->useName, back->value16,
+                              back->value8, Text(back->filterName), Text(back[1].filterName)),
+              std::make_tuple(uint8_t{c.use16 != 0}, uint8_t{c.use8 != 0}, c.useName,
+                              uint16_t{0xBEEF}, uint8_t{0x5A}, name, std::string()));
+    svDisposeHandle(back[0].filterName);
+    svDisposeHandle(back[1].filterName);
+    svDisposeHandle(read);
+  }
+  // An empty array writes nothing at all.
+  SvHandle empty = Keep(svNewHandleClr(8));
+  kvsimLogClear();
+  EXPECT_EQ(kvsvSessionSetPropExCluster1D(session, nullptr, id, &empty, &info_), 0);
+  EXPECT_EQ(kvsimLogCount(), 0);
 }
 
 }  // namespace
