@@ -2,6 +2,7 @@
 
 #include <charconv>
 #include <cstdlib>
+#include <type_traits>
 
 #include "dbc_attributes.h"
 
@@ -43,6 +44,13 @@ std::vector<tAttributeDefinition> OwnDefinitions() {
   format.enumTexts.push_back("ExtendedCAN_FD");
   own.push_back(format);
   own.push_back(Numeric(kAttrOfSignal, kAttrStartValue, "FLOAT", "-1e308", "1e308", "0"));
+  own.push_back(Numeric(kAttrOfEcu, kAttrStationAddress, "INT", "0", "255",
+                        std::to_string(kJ1939NullAddress).c_str()));
+  tAttributeDefinition pdus;
+  pdus.objectKind = kAttrOfFrame;
+  pdus.name = kAttrPduMapping;
+  pdus.type = "STRING";
+  own.push_back(pdus);
   return own;
 }
 
@@ -66,7 +74,54 @@ void Carry(tAttributeValues *values, std::string_view name, bool differs, tAttri
   if (differs || values->count(key) != 0) (*values)[key] = std::move(value);
 }
 
+template <class Item>
+std::string Listed(const std::vector<Item> &items) {
+  std::string text;
+  for (const Item &item : items) {
+    if (!text.empty()) text += ',';
+    if constexpr (std::is_same_v<Item, std::string>) {
+      text += item;
+    } else {
+      text += std::to_string(item);
+    }
+  }
+  return text;
+}
+
+std::vector<std::string> Cut(const std::string &text, char separator) {
+  std::vector<std::string> parts;
+  size_t from = 0;
+  for (size_t at; (at = text.find(separator, from)) != std::string::npos; from = at + 1) {
+    parts.push_back(text.substr(from, at - from));
+  }
+  parts.push_back(text.substr(from));
+  return parts;
+}
+
+bool ParseBits(const std::string &text, std::vector<uint32_t> *bits) {
+  if (text.empty()) return true;
+  for (const std::string &part : Cut(text, ',')) {
+    uint32_t bit = 0;
+    const auto result = std::from_chars(part.data(), part.data() + part.size(), bit);
+    if (result.ec != std::errc() || result.ptr != part.data() + part.size()) return false;
+    bits->push_back(bit);
+  }
+  return true;
+}
+
 }  // namespace
+
+std::string PduMappingText(const tPduMapping &mapping) {
+  return Listed(mapping.pdus) + "|" + Listed(mapping.startBits) + "|" + Listed(mapping.updateBits);
+}
+
+bool ParsePduMapping(const std::string &text, tPduMapping *mapping) {
+  const std::vector<std::string> lists = Cut(text, '|');
+  if (lists.size() != 3) return false;
+  *mapping = tPduMapping{};
+  if (!lists[0].empty()) mapping->pdus = Cut(lists[0], ',');
+  return ParseBits(lists[1], &mapping->startBits) && ParseBits(lists[2], &mapping->updateBits);
+}
 
 std::string NumberText(double value) {
   char buffer[32];
@@ -91,7 +146,12 @@ tAttributeValues ClusterAttributes(const tCluster &cluster) {
   return values;
 }
 
-tAttributeValues EcuAttributes(const tEcu &ecu) { return ecu.attributes; }
+tAttributeValues EcuAttributes(const tEcu &ecu) {
+  tAttributeValues values = ecu.attributes;
+  Carry(&values, kAttrStationAddress, ecu.j1939Address != kJ1939NullAddress,
+        {std::to_string(ecu.j1939Address), false});
+  return values;
+}
 
 tAttributeValues FrameAttributes(const tCluster &cluster, const tFrame &frame) {
   tAttributeValues values = frame.attributes;
@@ -106,6 +166,7 @@ tAttributeValues FrameAttributes(const tCluster &cluster, const tFrame &frame) {
                         (stored->second.text == std::to_string(kFormatStandardCanFd) ||
                          stored->second.text == std::to_string(kFormatExtendedCanFd));
   if (fd || storedFd) values[std::string(kAttrFrameFormat)] = {std::to_string(format), false};
+  if (frame.pdus) values[std::string(kAttrPduMapping)] = {PduMappingText(*frame.pdus), true};
   return values;
 }
 

@@ -23,6 +23,10 @@ tAttributeValues EcuAttributes(const tEcu &ecu);
 tAttributeValues FrameAttributes(const tCluster &cluster, const tFrame &frame);
 tAttributeValues SignalAttributes(const tCluster &cluster, const tSignal &signal);
 
+// A frame's PDUs as the text of its attribute, and back; false for a text that is not one.
+std::string PduMappingText(const tPduMapping &mapping);
+bool ParsePduMapping(const std::string &text, tPduMapping *mapping);
+
 // The shortest text that reads back to the same double.
 std::string NumberText(double value);
 

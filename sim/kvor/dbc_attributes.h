@@ -14,6 +14,10 @@ constexpr std::string_view kAttrStartValue = "GenSigStartValue";  // signal, raw
 constexpr std::string_view kAttrBaudRate = "Baudrate";            // cluster
 constexpr std::string_view kAttrFdBaudRate = "BaudrateCANFD";     // cluster, data phase
 constexpr std::string_view kAttrClusterName = "DBName";           // cluster
+constexpr std::string_view kAttrStationAddress = "NmStationAddress";  // ECU, J1939 address
+// Frame, the PDUs that it carries when not only its own: "names|start bits|update bits", each
+// list cut by commas.
+constexpr std::string_view kAttrPduMapping = "PduMapping";
 
 // Indexes of the frame format enumeration; those between are not CAN frames.
 constexpr uint32_t kFormatStandardCan = 0;

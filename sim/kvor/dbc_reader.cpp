@@ -6,6 +6,7 @@
 #include <set>
 #include <utility>
 
+#include "dbc_attribute_values.h"
 #include "dbc_attributes.h"
 #include "dbc_tokens.h"
 #include "signal_codec.h"
@@ -511,6 +512,14 @@ void cDbcParser::ReadAttribute(uint32_t line) {
     if (format == kFormatStandardCanFd || format == kFormatExtendedCanFd) {
       frame->format = FrameFormat::kCanFd;
     }
+  } else if (frame != nullptr && name == kAttrPduMapping) {
+    tPduMapping mapping;
+    if (value.kind != Kind::kString || !ParsePduMapping(value.text, &mapping)) {
+      Fail(value.line, "bad PDU mapping '" + value.text + "'");
+    }
+    frame->pdus = std::move(mapping);
+  } else if (ecu != nullptr && name == kAttrStationAddress) {
+    ecu->j1939Address = ToU32(value, "station address");
   } else if (signal != nullptr && name == kAttrStartValue) {
     signal->defaultRaw = ToDouble(value, "start value");
     startValueSet_.insert(signal);

@@ -507,7 +507,7 @@ TEST_F(KvorDatabase, AttributesAreGivenByValueDefaultEnumerationAndName) {
   } cases[] = {
       {a, 0, "Role", "Gateway", 0},       {b, 0, "Role", "Sensor", 1},
       {s, 0, "Res", "0.5", 1},            {database, 0, "Owner", "me", 0},
-      {a, 1, "Role", "Gateway,Sensor", 7}, {a, 2, nullptr, "Role", 7},
+      {a, 1, "Role", "Gateway,Sensor", 7}, {a, 2, nullptr, "Role,NmStationAddress", 7},
       {s, 1, "Res", "<none>", 7},         {s, 0, "Role", "<none>", 7},
   };
   for (const auto &c : cases) {
@@ -521,8 +521,7 @@ TEST_F(KvorDatabase, AttributesAreGivenByValueDefaultEnumerationAndName) {
 }  // namespace
 
 // A small file whose every value is known, read by class and identifier as the text says; then
-// edited, saved and read back, with the PDUs and LIN schedules that only live in memory set on
-// the copy.
+// edited, saved and read back, with the LIN schedules that only live in memory set on the copy.
 const char kPropertyText[] =
     "VERSION \"\"\n"
     "BU_: Engine Dash\n"
@@ -613,14 +612,13 @@ TEST_F(KvorDatabase, EveryClassAnswersItsPropertiesAndEditsSurviveASaveAndALoad)
   set(find(0x30000, "Speed.Kmh"), kvPropSig_ScaleFac, 0.25);
   set(find(0x50000, "Engine"), kvPropECU_TxFrmRefs, std::array<uint32_t, 2>{speed, lamp});
   EXPECT_EQ(kvdbSetProperty(find(0x50000, "Engine"), kvPropECU_RxFrmRefs, 0, nullptr), 0);
+  set(find(0x50000, "Dash"), kvPropECU_J1939PreferredAddress, uint32_t{17});
+  set(speed, kvPropFrm_PDURefs, std::array<uint32_t, 2>{find(0x80000, "Lamp"), find(0x80000, "Speed")});
+  set(speed, kvPropFrm_PDUStartBits, std::array<uint32_t, 2>{0, 32});
+  set(speed, kvPropFrm_PDUUpdateBits, std::array<uint32_t, 2>{63, 0xFFFFFFFF});
 
   database = SavedAndReloaded(database, "edited.dbc");
   cluster = DbCluster(database);
-  set(find(0x50000, "Dash"), kvPropECU_J1939PreferredAddress, uint32_t{17});
-  set(find(0x20000, "Speed"), kvPropFrm_PDURefs,
-      std::array<uint32_t, 2>{find(0x80000, "Lamp"), find(0x80000, "Speed")});
-  set(find(0x20000, "Speed"), kvPropFrm_PDUStartBits, std::array<uint32_t, 2>{0, 32});
-  set(find(0x20000, "Speed"), kvPropFrm_PDUUpdateBits, std::array<uint32_t, 2>{63, 0xFFFFFFFF});
   uint32_t main = 0, spare = 0, slot = 0;
   ASSERT_EQ(kvdbCreateObject(cluster, 0x60000, "Main", &main) + kvdbCreateObject(cluster, 0x60000, "Spare", &spare) +
                 kvdbCreateObject(main, 0x70000, "Slot", &slot), 0);
