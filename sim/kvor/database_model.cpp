@@ -90,13 +90,16 @@ void ForgetFrame(tCluster *cluster, const std::string &name) {
     for (size_t i = mapping.pdus.size(); i-- > 0;) {
       if (mapping.pdus[i] != name) continue;
       mapping.pdus.erase(mapping.pdus.begin() + static_cast<std::ptrdiff_t>(i));
-      if (i < mapping.startBits.size()) mapping.startBits.erase(mapping.startBits.begin() + static_cast<std::ptrdiff_t>(i));
-      if (i < mapping.updateBits.size()) mapping.updateBits.erase(mapping.updateBits.begin() + static_cast<std::ptrdiff_t>(i));
+      if (i < mapping.startBits.size())
+        mapping.startBits.erase(mapping.startBits.begin() + static_cast<std::ptrdiff_t>(i));
+      if (i < mapping.updateBits.size())
+        mapping.updateBits.erase(mapping.updateBits.begin() + static_cast<std::ptrdiff_t>(i));
     }
   }
   for (tLinSchedule &schedule : cluster->linSchedules) {
     for (tLinScheduleEntry &entry : schedule.entries) {
-      entry.frames.erase(std::remove(entry.frames.begin(), entry.frames.end(), name), entry.frames.end());
+      entry.frames.erase(std::remove(entry.frames.begin(), entry.frames.end(), name),
+                         entry.frames.end());
     }
   }
 }
@@ -115,8 +118,10 @@ void AddMissingSubframes(tFrame *frame) {
   for (const tSignal &signal : frame->signals) {
     if (signal.mux != MuxRole::kMultiplexed) continue;
     bool known = false;
-    for (const tSubframe &subframe : frame->subframes) known = known || subframe.muxValue == signal.muxValue;
-    if (!known) frame->subframes.push_back(tSubframe{SubframeName(signal.muxValue), signal.muxValue});
+    for (const tSubframe &subframe : frame->subframes)
+      known = known || subframe.muxValue == signal.muxValue;
+    if (!known)
+      frame->subframes.push_back(tSubframe{SubframeName(signal.muxValue), signal.muxValue});
   }
 }
 

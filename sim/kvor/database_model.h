@@ -134,7 +134,12 @@ struct tEcu {
 };
 
 // Values of kvPropLINSchedEntry_Type.
-enum class EntryType : uint32_t { kUnconditional = 0, kSporadic = 1, kEventTriggered = 2, kDiagnostic = 3 };
+enum class EntryType : uint32_t {
+  kUnconditional = 0,
+  kSporadic = 1,
+  kEventTriggered = 2,
+  kDiagnostic = 3
+};
 // Values of kvPropLINSched_RunMode.
 enum class RunMode : uint32_t { kContinuous = 0, kOnce = 1, kNull = 2 };
 
@@ -146,7 +151,7 @@ struct tLinScheduleEntry {
   uint32_t eventId = 0;
   EntryType type = EntryType::kUnconditional;
   std::vector<std::string> frames;
-  std::string collisionSchedule;  // empty: none
+  std::string collisionSchedule;         // empty: none
   std::vector<uint8_t> diagnosticBytes;  // a diagnostic entry's node configuration data
 };
 

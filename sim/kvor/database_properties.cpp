@@ -71,7 +71,8 @@ template <class Keep>
 PropertyValue SignalHandles(const tObjectRef &frameRef, iObjectHandles &handles, Keep keep) {
   std::vector<uint32_t> list;
   for (tSignal &signal : frameRef.frame->signals) {
-    if (keep(signal)) list.push_back(handles.HandleOf(SignalRef(frameRef, frameRef.frame, &signal)));
+    if (keep(signal))
+      list.push_back(handles.HandleOf(SignalRef(frameRef, frameRef.frame, &signal)));
   }
   return HandleArrayValue(list);
 }
@@ -102,7 +103,8 @@ PropertyValue CarryingFrames(const tObjectRef &pdu, iObjectHandles &handles) {
   std::vector<uint32_t> list;
   for (tFrame &frame : pdu.cluster->frames) {
     const tPduMapping mapping = PduMappingOf(frame);
-    if (std::find(mapping.pdus.begin(), mapping.pdus.end(), pdu.frame->name) != mapping.pdus.end()) {
+    if (std::find(mapping.pdus.begin(), mapping.pdus.end(), pdu.frame->name) !=
+        mapping.pdus.end()) {
       list.push_back(handles.HandleOf(FrameRef(pdu, &frame)));
     }
   }
@@ -305,7 +307,8 @@ std::optional<PropertyValue> SubframeProperty(const tObjectRef &object, uint32_t
       return Plain(subframe.muxValue);
     case kvPropSubfrm_ConfigStatus:
       for (const tSignal &signal : object.frame->signals) {
-        const bool own = signal.mux == MuxRole::kMultiplexed && signal.muxValue == subframe.muxValue;
+        const bool own =
+            signal.mux == MuxRole::kMultiplexed && signal.muxValue == subframe.muxValue;
         if (own && !SignalFits(signal, object.frame->payloadLength)) {
           return Plain(static_cast<uint32_t>(kvsimErrSignalLayout));
         }

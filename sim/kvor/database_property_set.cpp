@@ -169,7 +169,8 @@ Status SetSignal(const tObjectRef &object, uint32_t id, const tCallerValue &valu
       signal.unit = value.Text();
       return 0;
     case kvPropSig_ByteOrdr:
-      if (value.U32() > static_cast<uint32_t>(ByteOrder::kBigEndian)) return kvsimErrInvalidArgument;
+      if (value.U32() > static_cast<uint32_t>(ByteOrder::kBigEndian))
+        return kvsimErrInvalidArgument;
       signal.byteOrder = static_cast<ByteOrder>(value.U32());
       return 0;
     case kvPropSig_DataType:
@@ -227,9 +228,11 @@ Status SetSignal(const tObjectRef &object, uint32_t id, const tCallerValue &valu
 
 // The ECU sends exactly the frames of `value`: it becomes their transmitter, and no longer sends
 // those that it sent before and that the list leaves out.
-Status SetTransmitted(const tObjectRef &object, const tCallerValue &value, iObjectHandles &handles) {
+Status SetTransmitted(const tObjectRef &object, const tCallerValue &value,
+                      iObjectHandles &handles) {
   std::vector<std::string> names;
-  if (const Status status = NamesOfHandles(object, value, kClassFrame, handles, FrameName, &names)) {
+  if (const Status status =
+          NamesOfHandles(object, value, kClassFrame, handles, FrameName, &names)) {
     return status;
   }
   for (tFrame &frame : object.cluster->frames) {
@@ -247,7 +250,8 @@ Status SetTransmitted(const tObjectRef &object, const tCallerValue &value, iObje
 // A frame without signals has nothing that a database file could name a receiver at.
 Status SetReceived(const tObjectRef &object, const tCallerValue &value, iObjectHandles &handles) {
   std::vector<std::string> names;
-  if (const Status status = NamesOfHandles(object, value, kClassFrame, handles, FrameName, &names)) {
+  if (const Status status =
+          NamesOfHandles(object, value, kClassFrame, handles, FrameName, &names)) {
     return status;
   }
   const std::string &ecu = object.ecu->name;
@@ -261,7 +265,8 @@ Status SetReceived(const tObjectRef &object, const tCallerValue &value, iObjectH
       auto &receivers = signal.receivers;
       const bool has = std::find(receivers.begin(), receivers.end(), ecu) != receivers.end();
       if (listed && !has) receivers.push_back(ecu);
-      if (!listed) receivers.erase(std::remove(receivers.begin(), receivers.end(), ecu), receivers.end());
+      if (!listed)
+        receivers.erase(std::remove(receivers.begin(), receivers.end(), ecu), receivers.end());
     }
   }
   return 0;
@@ -331,7 +336,6 @@ Status SetCluster(const tObjectRef &object, uint32_t id, const tCallerValue &val
   }
 }
 
-
 // LIN frame identifiers are 6 bits; a schedule's priority is a byte, of which 255 is no one's.
 constexpr uint32_t kMaxLinFrameId = 63;
 constexpr uint32_t kMaxSchedulePriority = 254;
@@ -378,7 +382,8 @@ Status SetEntry(const tObjectRef &object, uint32_t id, const tCallerValue &value
       entry.eventId = value.U32();
       return 0;
     case kvPropLINSchedEntry_Type:
-      if (value.U32() > static_cast<uint32_t>(EntryType::kDiagnostic)) return kvsimErrInvalidArgument;
+      if (value.U32() > static_cast<uint32_t>(EntryType::kDiagnostic))
+        return kvsimErrInvalidArgument;
       entry.type = static_cast<EntryType>(value.U32());
       return 0;
     case kvPropLINSchedEntry_NC_FF_DataBytes:
@@ -429,10 +434,10 @@ Status SetDatabaseProperty(const tObjectRef &object, uint32_t id, uint32_t size,
       return SetFrame(object, id, caller, handles);
     case kClassPdu: {
       // A PDU's own properties are those of the frame whose payload it is.
-      const uint32_t asFrame = id == kvPropPDU_Name          ? kvPropFrm_Name
-                               : id == kvPropPDU_Comment     ? kvPropFrm_Comment
-                               : id == kvPropPDU_PayloadLen  ? kvPropFrm_PayloadLen
-                                                             : 0;
+      const uint32_t asFrame = id == kvPropPDU_Name         ? kvPropFrm_Name
+                               : id == kvPropPDU_Comment    ? kvPropFrm_Comment
+                               : id == kvPropPDU_PayloadLen ? kvPropFrm_PayloadLen
+                                                            : 0;
       if (asFrame == 0) return kvsimErrPropertyReadOnly;
       return SetFrame(object, asFrame, caller, handles);
     }

@@ -558,7 +558,8 @@ TEST_F(KvorDatabase, EveryClassAnswersItsPropertiesAndEditsSurviveASaveAndALoad)
       {0x20000, "Speed", kvPropFrm_ID, "291", "300"},
       {0x20000, "Speed", kvPropFrm_CANTxTime, "0.1", "0.1"},
       {0x20000, "Speed", kvPropFrm_CANTimingType, "0", "0"},
-      {0x20000, "Speed", kvPropFrm_SigRefs, "Speed.Mode,Speed.Kmh,Speed.Rpm,", "Speed.Mode,Speed.Kmh,Speed.Rpm,"},
+      {0x20000, "Speed", kvPropFrm_SigRefs, "Speed.Mode,Speed.Kmh,Speed.Rpm,",
+       "Speed.Mode,Speed.Kmh,Speed.Rpm,"},
       {0x20000, "Speed", kvPropFrm_PDURefs, "Speed,", "Lamp,Speed,"},
       {0x20000, "Speed", kvPropFrm_PDUStartBits, "0,", "0,32,"},
       {0x20000, "Speed", kvPropFrm_PDUUpdateBits, "4294967295,", "63,4294967295,"},
@@ -601,7 +602,8 @@ TEST_F(KvorDatabase, EveryClassAnswersItsPropertiesAndEditsSurviveASaveAndALoad)
   };
   for (const auto &row : rows) {
     if (row.read != nullptr) {
-      EXPECT_EQ(Shown(find(row.objectClass, row.name), row.id), row.read) << row.name << " " << std::hex << row.id;
+      EXPECT_EQ(Shown(find(row.objectClass, row.name), row.id), row.read)
+          << row.name << " " << std::hex << row.id;
     }
   }
   const auto set = [&](uint32_t object, uint32_t id, auto value) {
@@ -613,22 +615,27 @@ TEST_F(KvorDatabase, EveryClassAnswersItsPropertiesAndEditsSurviveASaveAndALoad)
   set(find(0x50000, "Engine"), kvPropECU_TxFrmRefs, std::array<uint32_t, 2>{speed, lamp});
   EXPECT_EQ(kvdbSetProperty(find(0x50000, "Engine"), kvPropECU_RxFrmRefs, 0, nullptr), 0);
   set(find(0x50000, "Dash"), kvPropECU_J1939PreferredAddress, uint32_t{17});
-  set(speed, kvPropFrm_PDURefs, std::array<uint32_t, 2>{find(0x80000, "Lamp"), find(0x80000, "Speed")});
+  set(speed, kvPropFrm_PDURefs,
+      std::array<uint32_t, 2>{find(0x80000, "Lamp"), find(0x80000, "Speed")});
   set(speed, kvPropFrm_PDUStartBits, std::array<uint32_t, 2>{0, 32});
   set(speed, kvPropFrm_PDUUpdateBits, std::array<uint32_t, 2>{63, 0xFFFFFFFF});
 
   database = SavedAndReloaded(database, "edited.dbc");
   cluster = DbCluster(database);
   uint32_t main = 0, spare = 0, slot = 0;
-  ASSERT_EQ(kvdbCreateObject(cluster, 0x60000, "Main", &main) + kvdbCreateObject(cluster, 0x60000, "Spare", &spare) +
-                kvdbCreateObject(main, 0x70000, "Slot", &slot), 0);
+  ASSERT_EQ(kvdbCreateObject(cluster, 0x60000, "Main", &main) +
+                kvdbCreateObject(cluster, 0x60000, "Spare", &spare) +
+                kvdbCreateObject(main, 0x70000, "Slot", &slot),
+            0);
   set(main, kvPropLINSched_Priority, uint32_t{3});
-  set(slot, kvPropLINSchedEntry_Frames, std::array<uint32_t, 2>{find(0x20000, "Speed"), find(0x20000, "Lamp")});
+  set(slot, kvPropLINSchedEntry_Frames,
+      std::array<uint32_t, 2>{find(0x20000, "Speed"), find(0x20000, "Lamp")});
   set(slot, kvPropLINSchedEntry_CollisionResSched, spare);
   set(slot, kvPropLINSchedEntry_Delay, 0.01);
   set(slot, kvPropLINSchedEntry_Type, uint32_t{2});
   for (const auto &row : rows) {
-    EXPECT_EQ(Shown(find(row.objectClass, row.name), row.id), row.edited) << row.name << " " << std::hex << row.id;
+    EXPECT_EQ(Shown(find(row.objectClass, row.name), row.id), row.edited)
+        << row.name << " " << std::hex << row.id;
   }
 }
 
@@ -636,10 +643,13 @@ TEST_F(KvorDatabase, PropertiesAreRefusedWithTheStatusOfWhatIsWrong) {
   uint32_t database = 0;
   ASSERT_EQ(OpenText(kPropertyText, &database), 0) << DatabaseErrorText();
   const uint32_t cluster = DbCluster(database);
-  const uint32_t speed = DbFind(cluster, 0x20000, "Speed"), kmh = DbFind(cluster, 0x30000, "Speed.Kmh");
+  const uint32_t speed = DbFind(cluster, 0x20000, "Speed"),
+                 kmh = DbFind(cluster, 0x30000, "Speed.Kmh");
   const uint32_t engine = DbFind(cluster, 0x50000, "Engine");
   uint32_t schedule = 0, entry = 0;
-  ASSERT_EQ(kvdbCreateObject(cluster, 0x60000, "Main", &schedule) + kvdbCreateObject(schedule, 0x70000, "Slot", &entry), 0);
+  ASSERT_EQ(kvdbCreateObject(cluster, 0x60000, "Main", &schedule) +
+                kvdbCreateObject(schedule, 0x70000, "Slot", &entry),
+            0);
   const struct {
     const char *what;
     uint32_t object, id;
@@ -649,18 +659,29 @@ TEST_F(KvorDatabase, PropertiesAreRefusedWithTheStatusOfWhatIsWrong) {
     int32_t status;
   } rows[] = {
       {"a number read into 8 bytes", speed, kvPropFrm_ID, false, 8, 0, kvsimErrPropertySize},
-      {"a list read into too few bytes", speed, kvPropFrm_SigRefs, false, 4, 0, kvsimErrBufferTooSmall},
+      {"a list read into too few bytes", speed, kvPropFrm_SigRefs, false, 4, 0,
+       kvsimErrBufferTooSmall},
       {"a double set from 4 bytes", kmh, kvPropSig_ScaleFac, true, 4, 0, kvsimErrPropertySize},
-      {"a signal's property of a frame", speed, kvPropSig_StartBit, false, 4, 0, kvsimErrPropertyUnknown},
-      {"a LIN property of a CAN frame", speed, kvPropFrm_LINChecksum, false, 4, 0, kvsimErrWrongProtocol},
-      {"a collision schedule never set", entry, kvPropLINSchedEntry_CollisionResSched, false, 4, 0, kvsimErrPropertyUnknown},
-      {"a set of what follows from others", speed, kvPropFrm_SigRefs, true, 0, 0, kvsimErrPropertyReadOnly},
-      {"a standard identifier above 0x7FF", speed, kvPropFrm_ID, true, 4, 0x800, kvsimErrInvalidArgument},
-      {"a PDU start beyond the payload", speed, kvPropFrm_PDUStartBits, true, 4, 64, kvsimErrInvalidArgument},
-      {"an entry type above 3", entry, kvPropLINSchedEntry_Type, true, 4, 4, kvsimErrInvalidArgument},
-      {"a schedule priority of 255", schedule, kvPropLINSched_Priority, true, 4, 255, kvsimErrInvalidArgument},
-      {"a signal among sent frames", engine, kvPropECU_TxFrmRefs, true, 4, kmh, kvsimErrWrongObject},
-      {"a frame as a collision schedule", entry, kvPropLINSchedEntry_CollisionResSched, true, 4, speed, kvsimErrWrongObject},
+      {"a signal's property of a frame", speed, kvPropSig_StartBit, false, 4, 0,
+       kvsimErrPropertyUnknown},
+      {"a LIN property of a CAN frame", speed, kvPropFrm_LINChecksum, false, 4, 0,
+       kvsimErrWrongProtocol},
+      {"a collision schedule never set", entry, kvPropLINSchedEntry_CollisionResSched, false, 4, 0,
+       kvsimErrPropertyUnknown},
+      {"a set of what follows from others", speed, kvPropFrm_SigRefs, true, 0, 0,
+       kvsimErrPropertyReadOnly},
+      {"a standard identifier above 0x7FF", speed, kvPropFrm_ID, true, 4, 0x800,
+       kvsimErrInvalidArgument},
+      {"a PDU start beyond the payload", speed, kvPropFrm_PDUStartBits, true, 4, 64,
+       kvsimErrInvalidArgument},
+      {"an entry type above 3", entry, kvPropLINSchedEntry_Type, true, 4, 4,
+       kvsimErrInvalidArgument},
+      {"a schedule priority of 255", schedule, kvPropLINSched_Priority, true, 4, 255,
+       kvsimErrInvalidArgument},
+      {"a signal among sent frames", engine, kvPropECU_TxFrmRefs, true, 4, kmh,
+       kvsimErrWrongObject},
+      {"a frame as a collision schedule", entry, kvPropLINSchedEntry_CollisionResSched, true, 4,
+       speed, kvsimErrWrongObject},
   };
   for (const auto &row : rows) {
     uint64_t value = row.value;
