@@ -7,6 +7,7 @@ add_library(kvsv_drive STATIC
   ${CMAKE_CURRENT_LIST_DIR}/drive_scenario.cpp
   ${CMAKE_CURRENT_LIST_DIR}/drive_signals.cpp
   ${CMAKE_CURRENT_LIST_DIR}/library_exports.cpp
+  ${CMAKE_CURRENT_LIST_DIR}/receive_filter_tour.cpp
   ${CMAKE_CURRENT_LIST_DIR}/signals_svg.cpp)
 target_include_directories(kvsv_drive PUBLIC ${CMAKE_CURRENT_LIST_DIR})
 # The host the demonstration plays offers the removal of references by name, as hosts do.

@@ -167,7 +167,8 @@ class cDrive {
     for (size_t g = 0; g < r_.groups.size(); ++g)
       r_.groups[g].cycleTicks = static_cast<int32_t>(cycleMs[g] / tickMs);
     r_.tickSeconds = static_cast<double>(tickMs) / 1000;
-    ticks_ = static_cast<size_t>(std::max(options_.steps, 0)) * static_cast<size_t>(kStepMs / tickMs);
+    ticks_ =
+        static_cast<size_t>(std::max(options_.steps, 0)) * static_cast<size_t>(kStepMs / tickMs);
   }
 
   bool WriteSessionFile() {
@@ -185,7 +186,8 @@ class cDrive {
       for (size_t i : g.signals) list += (list.empty() ? "" : ",") + r_.signals[i].item;
       entry(g.session, kvMode_SignalOutSinglePoint, 0, false, list);
     }
-    for (const tProjectSession &s : kSessions) entry(s.name, s.mode, s.rate, s.reads, s.signals ? all : "-");
+    for (const tProjectSession &s : kSessions)
+      entry(s.name, s.mode, s.rate, s.reads, s.signals ? all : "-");
     file.close();
     return !file.fail() || Fail("write of the session file", kvErrSessionFile);
   }

@@ -16,6 +16,7 @@
 #include "database_tour.h"
 #include "drive_scenario.h"
 #include "library_exports.h"
+#include "receive_filter_tour.h"
 #include "signals_svg.h"
 
 namespace {
@@ -150,6 +151,30 @@ bool PrintPropertyTour(const tPropertyTour &t, const std::string &frame) {
   return !t.signals.empty() && t.factorReloaded == t.factorSet && !t.mappingAfter.empty();
 }
 
+std::string FilterText(const tFilterEntry &f) {
+  std::string text;
+  char value16[16];
+  std::snprintf(value16, sizeof value16, "0x%04X", f.value16);
+  if (f.useValue16) text += std::string(" value16=") + value16;
+  if (f.useValue8) text += " value8=" + std::to_string(f.value8);
+  if (f.useName) text += " name=\"" + f.name + "\"";
+  return text.empty() ? " (matches all)" : text;
+}
+
+bool PrintFilterTour(const tFilterTour &t) {
+  std::printf("\nEthernet receive filter on ENET1, written and read back:\n");
+  if (t.status < 0) {
+    std::fprintf(stderr, "%s failed: status 0x%08" PRIX32 "\n", t.failedCall.c_str(),
+                 static_cast<uint32_t>(t.status));
+    return false;
+  }
+  for (size_t i = 0; i < t.written.size(); ++i) {
+    std::printf("  entry %zu:%s -> %s\n", i, FilterText(t.written[i]).c_str(),
+                i < t.read.size() && t.read[i] == t.written[i] ? "same" : "DIFFERENT");
+  }
+  return t.read == t.written;
+}
+
 bool WritePicture(const tDriveResult &r, const std::string &directory) {
   std::vector<tPlotCurve> curves;
   for (size_t i = 0; i < r.waveforms.size() && i < 2; ++i) {
@@ -226,5 +251,8 @@ int main(int argc, char **argv) {
   const tPropertyTour properties = RunPropertyTour(
       exports, KVSV_DEMO_DBC, std::filesystem::absolute(outDirectory).string(), frame);
   const bool read = PrintPropertyTour(properties, frame);
-  return toured && read && pictured ? 0 : 1;
+  const tFilterTour filter = RunReceiveFilterTour(
+      exports, "ENET1", {{true, 0x88F7, false, 0, true, "ptp"}, {false, 0, true, 17, false, ""}});
+  const bool filtered = PrintFilterTour(filter);
+  return toured && read && filtered && pictured ? 0 : 1;
 }

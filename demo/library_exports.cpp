@@ -44,6 +44,10 @@ tLibraryExports ExportsOf(void *library, std::string &error) {
   Find(library, "kvsvdbGetPropString", e.dbGetPropString, error);
   Find(library, "kvsvdbGetPropPDU_Mapping", e.dbGetPropPDU_Mapping, error);
   Find(library, "kvsvdbSetPropPDU_Mapping", e.dbSetPropPDU_Mapping, error);
+  Find(library, "kvsvSessionManualCreate", e.sessionManualCreate, error);
+  Find(library, "kvsvSessionClear", e.sessionClear, error);
+  Find(library, "kvsvSessionGetPropExCluster1D", e.sessionGetPropExCluster1D, error);
+  Find(library, "kvsvSessionSetPropExCluster1D", e.sessionSetPropExCluster1D, error);
   return e;
 }
 

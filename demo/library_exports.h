@@ -38,6 +38,10 @@ struct tLibraryExports {
   decltype(&kvsvdbGetPropString) dbGetPropString = nullptr;
   decltype(&kvsvdbGetPropPDU_Mapping) dbGetPropPDU_Mapping = nullptr;
   decltype(&kvsvdbSetPropPDU_Mapping) dbSetPropPDU_Mapping = nullptr;
+  decltype(&kvsvSessionManualCreate) sessionManualCreate = nullptr;
+  decltype(&kvsvSessionClear) sessionClear = nullptr;
+  decltype(&kvsvSessionGetPropExCluster1D) sessionGetPropExCluster1D = nullptr;
+  decltype(&kvsvSessionSetPropExCluster1D) sessionSetPropExCluster1D = nullptr;
 };
 
 // The exports of the library this program was linked with.

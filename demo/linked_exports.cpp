@@ -33,6 +33,10 @@ tLibraryExports LinkedExports() {
   e.dbGetPropString = &kvsvdbGetPropString;
   e.dbGetPropPDU_Mapping = &kvsvdbGetPropPDU_Mapping;
   e.dbSetPropPDU_Mapping = &kvsvdbSetPropPDU_Mapping;
+  e.sessionManualCreate = &kvsvSessionManualCreate;
+  e.sessionClear = &kvsvSessionClear;
+  e.sessionGetPropExCluster1D = &kvsvSessionGetPropExCluster1D;
+  e.sessionSetPropExCluster1D = &kvsvSessionSetPropExCluster1D;
   return e;
 }
 

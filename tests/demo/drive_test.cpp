@@ -18,6 +18,7 @@
 #include "database_property_tour.h"
 #include "database_tour.h"
 #include "drive_scenario.h"
+#include "receive_filter_tour.h"
 #include "kvsim.h"
 #include "kvsvplatform.h"
 #include "signals_svg.h"
@@ -282,6 +283,18 @@ TEST(DatabaseTour, ReadsSignalsAsTheFileWritesThemAndKeepsWhatItChanges) {
   EXPECT_EQ(std::make_pair(t.mappingAfter[0].startBit, t.mappingAfter[0].updateBit),
             std::make_pair(t.mappingBefore[0].startBit, 63u));
   EXPECT_EQ(std::make_tuple(kvsimLoadedDatabaseCount(), svsimRefCount()), std::make_tuple(0, 0));
+}
+
+// The receive filter tour: what is written is read back field by field, and the session ends.
+TEST(ReceiveFilterTour, ReadsBackEachEntryAndEndsItsSession) {
+  kvsimReset();
+  const std::vector<tFilterEntry> filter = {{true, 0x88F7, false, 0, true, "ptp"},
+                                            {false, 0, true, 17, false, ""},
+                                            {false, 0, false, 0, true, "eighteen_chars_abc"}};
+  const tFilterTour t = RunReceiveFilterTour(LinkedExports(), "ENET1", filter);
+  ASSERT_EQ(t.status, 0) << t.failedCall;
+  EXPECT_EQ(t.read, filter);
+  EXPECT_EQ(std::make_tuple(kvsimOpenSessionCount(), svsimRefCount()), std::make_tuple(0, 0));
 }
 
 // The points of each polyline of `svg`.
