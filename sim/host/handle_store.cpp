@@ -3,7 +3,6 @@
 #include <cstdlib>
 #include <cstring>
 #include <new>
-#include <type_traits>
 
 #if defined(__has_include)
 #if __has_include(<sanitizer/asan_interface.h>)
@@ -15,7 +14,6 @@
 #define ASAN_UNPOISON_MEMORY_REGION(address, size) ((void)(address), (void)(size))
 #endif
 
-#include "fatal.h"
 #include "fault_plan.h"
 
 namespace svhost {
@@ -34,12 +32,9 @@ void FreeBlock(void *block, size_t size) {
   std::free(block);
 }
 
-// The first slot to try for the slab at `base`: Fibonacci hashing of its number, 12 bits.
-size_t FirstSlot(uintptr_t base, size_t slabBytes) {
-  return static_cast<size_t>(((base / slabBytes) * 0x9E3779B97F4A7C15u) >> 52);
-}
-
 }  // namespace
+
+std::atomic<uintptr_t> HandleStore::slabs_[HandleStore::kSlabSlots];
 
 HandleStore &HandleStore::Instance() {
   // Never destroyed: the library may still dispose of handles from static destructors at exit.
@@ -47,32 +42,7 @@ HandleStore &HandleStore::Instance() {
   return *store;
 }
 
-HandleStore::Master *HandleStore::Lookup(SvHandle handle) const {
-  // A handle is the address of a record's first member, so the two convert into each other.
-  static_assert(std::is_standard_layout<Master>::value, "a handle must be its record's address");
-  static_assert(kSlabBytes % sizeof(Master) == 0, "records fill their slab exactly");
-  const uintptr_t address = reinterpret_cast<uintptr_t>(handle);
-  const uintptr_t base = address & ~uintptr_t{kSlabBytes - 1};
-  if (base == 0 || (address - base) % sizeof(Master) != 0) return nullptr;
-  // The table is never more than half full, so the probe ends at an empty slot.
-  for (size_t slot = FirstSlot(base, kSlabBytes);; slot = (slot + 1) % kSlabSlots) {
-    const uintptr_t slab = slabs_[slot].load(std::memory_order_acquire);
-    if (slab == base) return reinterpret_cast<Master *>(address);
-    if (slab == 0) return nullptr;
-  }
-}
-
-HandleStore::Master &HandleStore::Find(SvHandle handle, const char *operation) const {
-  Master *master = Lookup(handle);
-  if (master == nullptr || master->block.load(std::memory_order_acquire) == nullptr)
-    Fatal(operation, handle, "not a live handle (never made, or already disposed of)");
-  if (master->pointer != master->block.load(std::memory_order_relaxed))
-    Fatal(operation, handle, "master pointer overwritten: it no longer holds the handle's block");
-  return *master;
-}
-
 bool HandleStore::AddSlab() {
-  static_assert(kSlabSlots == size_t{1} << 12, "FirstSlot yields 12 bits");
   if (slabCount_ == kMaxSlabs) return false;
   void *slab = std::aligned_alloc(kSlabBytes, kSlabBytes);
   if (slab == nullptr) return false;
@@ -80,7 +50,7 @@ bool HandleStore::AddSlab() {
   const size_t count = kSlabBytes / sizeof(Master);
   for (size_t i = 0; i < count; ++i) new (first + i) Master{};
   const uintptr_t base = reinterpret_cast<uintptr_t>(slab);
-  size_t slot = FirstSlot(base, kSlabBytes);
+  size_t slot = FirstSlot(base);
   while (slabs_[slot].load(std::memory_order_relaxed) != 0) slot = (slot + 1) % kSlabSlots;
   slabs_[slot].store(base, std::memory_order_release);
   ++slabCount_;
@@ -144,10 +114,6 @@ int32_t HandleStore::Resize(SvHandle handle, size_t size, const char *operation)
   master.block.store(block, std::memory_order_release);
   ++resizes_;
   return 0;
-}
-
-size_t HandleStore::Size(SvHandle handle, const char *operation) {
-  return Find(handle, operation).size.load(std::memory_order_relaxed);
 }
 
 void HandleStore::Dispose(SvHandle handle, const char *operation) {

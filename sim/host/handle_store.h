@@ -9,7 +9,9 @@
 #include <cstddef>
 #include <cstdint>
 #include <mutex>
+#include <type_traits>
 
+#include "fatal.h"
 #include "kvsvapi.h"
 #include "svsim.h"
 
@@ -24,9 +26,11 @@ class HandleStore {
   // 0, or the resize error code with the block left as it was. Growth is zeroed. `operation`
   // names the caller in the message of a fatal stop, here and below.
   int32_t Resize(SvHandle handle, size_t size, const char *operation);
-  // Size of a live handle. Aborts on a handle that is not live. Takes no lock: threads that use
-  // different handles never wait for each other here.
-  size_t Size(SvHandle handle, const char *operation);
+  // Size of a live handle. Aborts on a handle that is not live. Takes no lock and is inline, since
+  // the library asks it for every frame it copies, as a real host answers it from a block header.
+  static size_t Size(SvHandle handle, const char *operation) {
+    return Find(handle, operation).size.load(std::memory_order_relaxed);
+  }
   void Dispose(SvHandle handle, const char *operation);
 
   void SetMoveOnResize(bool on);
@@ -60,15 +64,42 @@ class HandleStore {
   // handle keeps failing for a while instead of quietly reaching someone else's block.
   static constexpr size_t kQuarantine = 1024;
 
+  // The first slot of the table to try for the slab at `base`: Fibonacci hashing of its number.
+  static size_t FirstSlot(uintptr_t base) {
+    static_assert(kSlabSlots == size_t{1} << 12, "the hash yields 12 bits");
+    return static_cast<size_t>(((base / kSlabBytes) * 0x9E3779B97F4A7C15u) >> 52);
+  }
   // The record at `handle`, or null when `handle` is not the address of one.
-  Master *Lookup(SvHandle handle) const;
+  static Master *Lookup(SvHandle handle) {
+    // A handle is the address of a record's first member, so the two convert into each other.
+    static_assert(std::is_standard_layout<Master>::value, "a handle is its record's address");
+    static_assert(kSlabBytes % sizeof(Master) == 0, "records fill their slab exactly");
+    const uintptr_t address = reinterpret_cast<uintptr_t>(handle);
+    const uintptr_t base = address & ~uintptr_t{kSlabBytes - 1};
+    if (base == 0 || (address - base) % sizeof(Master) != 0) return nullptr;
+    // The table is never more than half full, so the probe ends at an empty slot.
+    for (size_t slot = FirstSlot(base);; slot = (slot + 1) % kSlabSlots) {
+      const uintptr_t slab = slabs_[slot].load(std::memory_order_acquire);
+      if (slab == base) return reinterpret_cast<Master *>(address);
+      if (slab == 0) return nullptr;
+    }
+  }
   // Aborts unless `handle` is live and its master pointer still holds the block it was given.
-  Master &Find(SvHandle handle, const char *operation) const;
+  static Master &Find(SvHandle handle, const char *operation) {
+    Master *master = Lookup(handle);
+    if (master == nullptr || master->block.load(std::memory_order_acquire) == nullptr)
+      Fatal(operation, handle, "not a live handle (never made, or already disposed of)");
+    if (master->pointer != master->block.load(std::memory_order_relaxed))
+      Fatal(operation, handle, "master pointer overwritten: it no longer holds the handle's block");
+    return *master;
+  }
   // A free record, or null when no memory is left for one. Under the mutex.
   Master *Take();
   bool AddSlab();
 
-  std::atomic<uintptr_t> slabs_[kSlabSlots] = {};
+  // Zero before any code runs and reached without a pointer to the store, so that the size query
+  // is a few loads; hidden, so that it is not reached through the symbol table either.
+  __attribute__((visibility("hidden"))) static std::atomic<uintptr_t> slabs_[kSlabSlots];
   std::mutex mutex_;
   size_t slabCount_ = 0;
   Master *fresh_ = nullptr;  // the rest of the newest slab, never handed out yet

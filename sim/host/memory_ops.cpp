@@ -18,7 +18,7 @@ int32_t svSetHandleSizeClr(SvHandle handle, size_t size) {
 
 size_t svGetHandleSize(SvHandle handle) {
   if (handle == nullptr) return 0;
-  return HandleStore::Instance().Size(handle, "svGetHandleSize");
+  return HandleStore::Size(handle, "svGetHandleSize");
 }
 
 int32_t svDisposeHandle(SvHandle handle) {
