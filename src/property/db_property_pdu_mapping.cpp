@@ -33,8 +33,7 @@ static_assert(offsetof(tPduMapping, startBit) == 8, "start bit behind the refere
 static_assert(offsetof(tPduMapping, updateBit) == 12, "update bit last");
 constexpr size_t kClusterArrayHeader = 8;
 
-constexpr uint32_t kParts[] = {kvPropFrm_PDURefs, kvPropFrm_PDUStartBits,
-                               kvPropFrm_PDUUpdateBits};
+constexpr uint32_t kParts[] = {kvPropFrm_PDURefs, kvPropFrm_PDUStartBits, kvPropFrm_PDUUpdateBits};
 
 tPduMapping *Elements(SvHandle array) {
   return reinterpret_cast<tPduMapping *>(static_cast<char *>(*array) + kClusterArrayHeader);

@@ -109,7 +109,7 @@ extern "C" KVSV_EXPORT kvsvStatus kvsvdbSetPropRef(uint32_t object, uint32_t id,
   return AnnotatedStatus(WriteReference(object, id, value), id, info);
 }
 
-extern "C" KVSV_EXPORT kvsvStatus kvsvdbSetPropRef1D(uint32_t object, uint32_t id,
-                                                     SvHandle *value, SvHandle *info) {
+extern "C" KVSV_EXPORT kvsvStatus kvsvdbSetPropRef1D(uint32_t object, uint32_t id, SvHandle *value,
+                                                     SvHandle *info) {
   return AnnotatedStatus(WriteReferences(object, id, value), id, info);
 }

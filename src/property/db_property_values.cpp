@@ -98,21 +98,21 @@ extern "C" KVSV_EXPORT kvsvStatus kvsvdbSetPropU8_1D(uint32_t object, uint32_t i
   return SetArray<uint8_t>(object, id, value, info);
 }
 
-extern "C" KVSV_EXPORT kvsvStatus kvsvdbGetPropU32_1D(uint32_t object, uint32_t id,
-                                                      SvHandle *value, SvHandle *info) {
+extern "C" KVSV_EXPORT kvsvStatus kvsvdbGetPropU32_1D(uint32_t object, uint32_t id, SvHandle *value,
+                                                      SvHandle *info) {
   return GetArray<uint32_t>(object, id, value, info);
 }
-extern "C" KVSV_EXPORT kvsvStatus kvsvdbSetPropU32_1D(uint32_t object, uint32_t id,
-                                                      SvHandle *value, SvHandle *info) {
+extern "C" KVSV_EXPORT kvsvStatus kvsvdbSetPropU32_1D(uint32_t object, uint32_t id, SvHandle *value,
+                                                      SvHandle *info) {
   return SetArray<uint32_t>(object, id, value, info);
 }
 
-extern "C" KVSV_EXPORT kvsvStatus kvsvdbGetPropString(uint32_t object, uint32_t id,
-                                                      SvHandle *value, SvHandle *info) {
+extern "C" KVSV_EXPORT kvsvStatus kvsvdbGetPropString(uint32_t object, uint32_t id, SvHandle *value,
+                                                      SvHandle *info) {
   return AnnotatedStatus(ReadText(object, id, value), id, info);
 }
-extern "C" KVSV_EXPORT kvsvStatus kvsvdbSetPropString(uint32_t object, uint32_t id,
-                                                      SvHandle *value, SvHandle *info) {
+extern "C" KVSV_EXPORT kvsvStatus kvsvdbSetPropString(uint32_t object, uint32_t id, SvHandle *value,
+                                                      SvHandle *info) {
   return AnnotatedStatus(WriteText(object, id, value), id, info);
 }
 
