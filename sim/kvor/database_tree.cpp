@@ -222,7 +222,8 @@ Status CreateChild(const tObjectRef &parent, uint32_t objectClass, const std::st
   }
   if (under == kClassLinSchedule && objectClass == kClassLinScheduleEntry) {
     if (Named(parent.schedule->entries, name) != nullptr) return kvsimErrObjectExists;
-    made->entry = &parent.schedule->entries.emplace_back(tLinScheduleEntry{name});
+    made->entry = &parent.schedule->entries.emplace_back();
+    made->entry->name = name;
     return 0;
   }
   if ((under == kClassFrame || under == kClassPdu || under == kClassSubframe) &&
