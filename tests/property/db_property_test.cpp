@@ -9,13 +9,12 @@
 
 #include "core/host_handles.h"
 #include "kvorproperties.h"
-#include "kvsim.h"
 #include "kvsvapi.h"
+#include "property/property_fixture.h"
 #include "support/call_log.h"
 #include "support/database_reads.h"
 #include "support/scoped_env.h"
 #include "support/temp_dir.h"
-#include "svsim.h"
 
 using namespace nKVSVAPI100;
 
@@ -23,9 +22,12 @@ namespace {
 
 using kvsvtest::DbFind;
 using kvsvtest::LastCall;
+using kvsvtest::NumberArray;
+using kvsvtest::Text;
+using kvsvtest::Texts;
 
 constexpr uint32_t kCluster = 0x10000, kFrame = 0x20000, kSignal = 0x30000, kEcu = 0x50000,
-                   kSchedule = 0x60000, kEntry = 0x70000, kPdu = 0x80000;
+                   kSchedule = 0x60000, kEntry = 0x70000;
 
 // Cluster Body: Speed sent by Engine and received by Dash, Brake, and Gear multiplexed by M.
 const char kDbc[] =
@@ -36,27 +38,6 @@ const char kDbc[] =
     " SG_ G0 m0 : 8|8@1+ (1,0) [0|255] \"\" Dash\n"
     "BA_DEF_ \"DBName\" STRING ;\nBA_ \"DBName\" \"Body\";\n";
 
-std::string Text(SvHandle string) {
-  char text[256] = {};
-  return std::string(text, static_cast<size_t>(svsimReadString(string, text, sizeof text)));
-}
-
-std::vector<std::string> Texts(SvHandle array) {
-  std::vector<std::string> texts;
-  for (int32_t i = 0; array != nullptr && i < ArrayCount(array); ++i)
-    texts.push_back(Text(ArrayData8<SvHandle>(array)[i]));
-  return texts;
-}
-
-// A host array of `width`-byte numbers: the count at byte 0, the numbers from byte 4.
-SvHandle NumberArray(const std::vector<uint32_t> &values, size_t width) {
-  SvHandle array = svNewHandleClr(8 + values.size() * width);
-  ArrayCount(array) = static_cast<int32_t>(values.size());
-  for (size_t i = 0; i < values.size(); ++i)
-    std::memcpy(static_cast<char *>(*array) + 4 + i * width, &values[i], width);
-  return array;
-}
-
 struct tMappingElement {
   SvHandle pdu;
   uint32_t startBit, updateBit;
@@ -66,14 +47,11 @@ tMappingElement *Mapping(SvHandle array) {
   return reinterpret_cast<tMappingElement *>(static_cast<char *>(*array) + 8);
 }
 
-class DbPropertyTest : public testing::Test {
+class DbPropertyTest : public PropertyFixture {
  protected:
   void SetUp() override {
-    kvsimReset();
-    svsimReset();
+    PropertyFixture::SetUp();
     dir_.WriteFile("body", kDbc);
-    dir_.WriteFile("plain",
-                   std::string(kDbc).replace(std::string(kDbc).find("\"Body\""), 6, "\"Cluster\""));
     database_ = kvsvtest::OpenDatabase("body");
     cluster_ = DbFind(database_, kCluster, "Body");
     speed_ = DbFind(cluster_, kFrame, "Speed");
@@ -83,32 +61,18 @@ class DbPropertyTest : public testing::Test {
     ASSERT_EQ(kvdbCreateObject(schedule_, kEntry, "First", &entry_), 0);
   }
   void TearDown() override {
-    for (SvHandle h : handles_) svDisposeHandle(h);
+    for (SvHandle &array : arrays_) DisposeHandleArray(&array);
     kvdbCloseDatabase(database_, 1);
     EXPECT_EQ(kvsimLoadedDatabaseCount(), 0);
+    PropertyFixture::TearDown();
   }
-  SvHandle Keep(SvHandle h) {
-    handles_.push_back(h);
-    return h;
-  }
-  // A host array of strings, its strings kept for disposal; null texts give null handles.
   SvHandle Strings(const std::vector<const char *> &texts) {
-    SvHandle array = Keep(svNewHandleClr(8 + texts.size() * 8));
-    ArrayCount(array) = static_cast<int32_t>(texts.size());
-    for (size_t i = 0; i < texts.size(); ++i)
-      ArrayData8<SvHandle>(array)[i] = texts[i] ? Keep(svsimMakeString(texts[i])) : nullptr;
-    return array;
-  }
-  std::string TakeInfo() {
-    const std::string text = info_ != nullptr ? Text(Keep(info_)) : "";
-    info_ = nullptr;
-    return text;
+    return arrays_.emplace_back(kvsvtest::StringArray(texts));
   }
 
   kvsvtest::cTempDir dir_;
   kvsvtest::cScopedEnv env_{"KVSIM_DATABASE_DIR", dir_.Path()};
-  std::vector<SvHandle> handles_;
-  SvHandle info_ = nullptr;
+  std::vector<SvHandle> arrays_;
   uint32_t database_ = 0, cluster_ = 0, speed_ = 0, gear_ = 0, schedule_ = 0, fallback_ = 0,
            entry_ = 0;
 };
@@ -174,7 +138,7 @@ TEST_F(DbPropertyTest, EachShapeSendsItsBytesAndASteadyReadMakesNoHandle) {
   kvsimFailProperty("kvdbGetProperty", kvPropSig_Unit, kvsimErrInternal, 1);
   EXPECT_EQ(kvsvdbGetPropString(signal, kvPropSig_Unit, &string, &info_), kvsimErrInternal);
   EXPECT_EQ(static_cast<SvStr *>(*string)->cnt, 4);
-  EXPECT_EQ(TakeInfo(), "\nProperty: Unit");
+  EXPECT_EQ(Annotation(), "\nProperty: Unit");
 }
 
 // What each kind of reference is known by: its object's name property, and its location.
@@ -204,27 +168,20 @@ TEST_F(DbPropertyTest, ReferencesReadAsTheNameTheirPropertyChooses) {
     SCOPED_TRACE(testing::Message() << std::hex << row.id);
     SvHandle out = nullptr;
     if ((row.id >> 24) == 0x06) {
-      ASSERT_EQ(kvsvdbGetPropRef1D(row.object, row.id, &out, &info_), 0) << TakeInfo();
+      ASSERT_EQ(kvsvdbGetPropRef1D(row.object, row.id, &out, &info_), 0) << Annotation();
       EXPECT_EQ(Texts(out), row.texts);
       DisposeHandleArray(&out);
     } else {
-      ASSERT_EQ(kvsvdbGetPropRef(row.object, row.id, &out, &info_), 0) << TakeInfo();
+      ASSERT_EQ(kvsvdbGetPropRef(row.object, row.id, &out, &info_), 0) << Annotation();
       EXPECT_EQ(Text(Keep(out)), row.texts.at(0));
     }
   }
-  // In the cluster named "Cluster" the location is the database alone.
-  const uint32_t plain = kvsvtest::OpenDatabase("plain");
-  const uint32_t plainFrame = DbFind(DbFind(plain, kCluster, "Cluster"), kFrame, "Speed");
-  SvHandle out = nullptr;
-  ASSERT_EQ(kvsvdbGetPropRef1D(plainFrame, kvPropFrm_SigRefs, &out, &info_), 0);
-  EXPECT_EQ(Texts(out), std::vector<std::string>{"Speed.Value\nplain"});
-  DisposeHandleArray(&out);
-  kvdbCloseDatabase(plain, 1);
   // Names have a shape of their own; a property that refers to nothing is no reference.
+  SvHandle out = nullptr;
   for (uint32_t id : {uint32_t{kvPropSig_Name}, uint32_t{kvPropSig_StartBit}}) {
     EXPECT_EQ(kvsvdbGetPropRef(value, id, &out, &info_), kvErrInternal);
     EXPECT_EQ(kvsvdbGetPropRef1D(value, id, &out, &info_), kvErrInternal);
-    EXPECT_NE(TakeInfo(), "");
+    EXPECT_NE(Annotation(), "");
   }
   EXPECT_EQ(out, nullptr);
 }
@@ -235,7 +192,7 @@ TEST_F(DbPropertyTest, ReferencesAreSetByTheirTextsAndEveryHandleMadeIsClosed) {
   SvHandle fallback = Keep(svsimMakeString("Fallback\nbody.Body")), out = nullptr;
   kvsimLogClear();
   EXPECT_EQ(kvsvdbSetPropRef(entry_, kvPropLINSchedEntry_Sched, &fallback, &info_), kvErrInternal);
-  EXPECT_EQ(TakeInfo(), "\nProperty: Sched");
+  EXPECT_EQ(Annotation(), "\nProperty: Sched");
   EXPECT_EQ(kvsvdbSetPropRef(entry_, kvPropLINSched_Name, &fallback, &info_), kvErrInternal);
   EXPECT_EQ(kvsimCountCalls("kvdbOpenDatabase") + kvsimCountCalls("kvdbSetProperty"), 0);
   ASSERT_EQ(kvsvdbSetPropRef(entry_, kvPropLINSchedEntry_CollisionResSched, &fallback, &info_), 0);
@@ -251,12 +208,12 @@ TEST_F(DbPropertyTest, ReferencesAreSetByTheirTextsAndEveryHandleMadeIsClosed) {
   kvsimLogClear();
   EXPECT_EQ(kvsvdbSetPropRef1D(engine, kvPropECU_TxFrmRefs, &broken, &info_),
             kvsimErrObjectNotFound);
-  EXPECT_EQ(TakeInfo(), "\nProperty: TxFrmRefs");
+  EXPECT_EQ(Annotation(), "\nProperty: TxFrmRefs");
   EXPECT_EQ(kvsimCountCalls("kvdbSetProperty"), 0);
   EXPECT_EQ(kvsimCountCalls("kvdbFindObject"), 4);
   EXPECT_EQ(kvsimCountCalls("kvdbCloseDatabase"), 2);
   kvsimLogClear();
-  ASSERT_EQ(kvsvdbSetPropRef1D(engine, kvPropECU_TxFrmRefs, &frames, &info_), 0) << TakeInfo();
+  ASSERT_EQ(kvsvdbSetPropRef1D(engine, kvPropECU_TxFrmRefs, &frames, &info_), 0) << Annotation();
   EXPECT_EQ(LastCall("kvdbSetProperty").size1, 8u);
   EXPECT_EQ(kvsimCountCalls("kvdbCloseDatabase"), 2);
   ASSERT_EQ(kvsvdbGetPropRef1D(engine, kvPropECU_TxFrmRefs, &out, &info_), 0);
@@ -310,7 +267,7 @@ TEST_F(DbPropertyTest, PduMappingJoinsThreeListsAndSplitsThemAgain) {
   kvsimLogClear();
   EXPECT_EQ(kvsvdbSetPropPDU_Mapping(speed_, kvPropFrm_PDU_Mapping, &source, &info_),
             kvErrDbReferenceEmpty);
-  EXPECT_EQ(TakeInfo(), "\nProperty: PDU_Mapping");
+  EXPECT_EQ(Annotation(), "\nProperty: PDU_Mapping");
   ArrayCount(source) = 0;
   ASSERT_EQ(kvsvdbSetPropPDU_Mapping(speed_, kvPropFrm_PDU_Mapping, &source, &info_), 0);
   std::vector<uint32_t> sets;
@@ -325,7 +282,7 @@ TEST_F(DbPropertyTest, PduMappingJoinsThreeListsAndSplitsThemAgain) {
   EXPECT_EQ(kvsvdbSetPropPDU_Mapping(speed_, kvPropFrm_PDURefs, &source, &info_), kvErrInternal);
   EXPECT_EQ(info_, nullptr);
   EXPECT_EQ(kvsvdbSetPropString1D(speed_, kvPropFrm_SigRefs, &mapping, &info_), kvErrInternal);
-  EXPECT_EQ(TakeInfo(), "\nProperty: SigRefs");
+  EXPECT_EQ(Annotation(), "\nProperty: SigRefs");
   DisposeHandleArray(&mapping);
 }
 
@@ -335,7 +292,7 @@ TEST_F(DbPropertyTest, UnknownIdentifiersAreTheDriversToRefuse) {
   SvHandle array = Strings({"kept"});
   EXPECT_EQ(kvsvdbGetPropString1D(speed_, 0x04020001, &array, &info_), kvsimErrPropertyUnknown);
   EXPECT_EQ(Texts(array), std::vector<std::string>{"kept"});
-  EXPECT_EQ(TakeInfo(), "\nProperty: (unknown ID hex 04020001)");
+  EXPECT_EQ(Annotation(), "\nProperty: (unknown ID hex 04020001)");
 }
 
 }  // namespace
