@@ -7,31 +7,21 @@
 #include <string>
 #include <vector>
 
+#include "core/host_handles.h"
 #include "kvsim.h"
 #include "kvsvapi.h"
 #include "support/call_log.h"
+#include "support/host_strings.h"
 #include "support/temp_dir.h"
 #include "svsim.h"
 
 namespace {
 
 using kvsvtest::LastCall;
+using kvsvtest::Text;
+using kvsvtest::Texts;
 
 constexpr int32_t kScripted = static_cast<int32_t>(0xBFF62ABC);
-
-std::string Text(SvHandle string) {
-  char text[256] = {};
-  return std::string(text, static_cast<size_t>(svsimReadString(string, text, sizeof text)));
-}
-
-// The strings of a host array: the count at byte 0, 8-byte string handles from byte 8.
-std::vector<std::string> Strings(SvHandle array) {
-  std::vector<std::string> strings;
-  const int32_t count = *static_cast<int32_t *>(*array);
-  for (int32_t i = 0; i < count; ++i)
-    strings.push_back(Text(reinterpret_cast<SvHandle *>(static_cast<char *>(*array) + 8)[i]));
-  return strings;
-}
 
 class DbEdit : public testing::Test {
  protected:
@@ -40,12 +30,8 @@ class DbEdit : public testing::Test {
     svsimReset();
   }
   void TearDown() override {
-    for (SvHandle *array : {&aliases_, &paths_}) {
-      if (*array == nullptr) continue;
-      for (int32_t i = 0; i < *static_cast<int32_t *>(**array); ++i)
-        svDisposeHandle(reinterpret_cast<SvHandle *>(static_cast<char *>(**array) + 8)[i]);
-      svDisposeHandle(*array);
-    }
+    nKVSVAPI100::DisposeHandleArray(&aliases_);
+    nKVSVAPI100::DisposeHandleArray(&paths_);
     if (value_ != nullptr) svDisposeHandle(value_);
     kvsimReset();
   }
@@ -106,8 +92,8 @@ TEST_F(DbEdit, TheListIsReadAgainWhileItChangesUpToElevenRounds) {
     EXPECT_EQ(kvsvdbGetDatabaseList(0, &aliases_, &paths_), c.status);
     EXPECT_EQ(kvsimCountCalls("kvdbGetDatabaseListSizes"), c.rounds);
     if (c.status == 0) {
-      EXPECT_EQ(Strings(aliases_), (std::vector<std::string>{"alpha", "beta"}));
-      EXPECT_EQ(Strings(paths_), std::vector<std::string>(2, directory.Sub("a.dbc")));
+      EXPECT_EQ(Texts(aliases_), (std::vector<std::string>{"alpha", "beta"}));
+      EXPECT_EQ(Texts(paths_), std::vector<std::string>(2, directory.Sub("a.dbc")));
     }
   }
   // Another failure ends the read at once.
@@ -120,14 +106,12 @@ TEST_F(DbEdit, TheListIsReadAgainWhileItChangesUpToElevenRounds) {
 }
 
 TEST_F(DbEdit, NoAliasLeavesBothHostArraysAsTheyWere) {
-  aliases_ = svNewHandleClr(16);
-  *static_cast<int32_t *>(*aliases_) = 1;
-  reinterpret_cast<SvHandle *>(static_cast<char *>(*aliases_) + 8)[0] = svsimMakeString("stale");
+  aliases_ = kvsvtest::StringArray({"stale"});
   const SvHandle before = aliases_;
   const uint64_t made = svsimAllocCount();
   EXPECT_EQ(kvsvdbGetDatabaseList(0, &aliases_, &paths_), 0);
   EXPECT_EQ(aliases_, before);
-  EXPECT_EQ(Strings(aliases_), std::vector<std::string>{"stale"});
+  EXPECT_EQ(Texts(aliases_), std::vector<std::string>{"stale"});
   EXPECT_EQ(paths_, nullptr);
   EXPECT_EQ(svsimAllocCount(), made);
   EXPECT_EQ(kvsimCountCalls("kvdbGetDatabaseList"), 0);

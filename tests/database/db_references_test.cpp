@@ -16,6 +16,7 @@
 #include "session/kvorutility.h"
 #include "support/call_log.h"
 #include "support/fake_error_log.h"
+#include "support/host_strings.h"
 #include "support/scoped_env.h"
 #include "support/temp_dir.h"
 #include "svsim.h"
@@ -24,6 +25,7 @@ namespace {
 
 using namespace nKVSVAPI100;
 using kvsvtest::LastCall;
+using kvsvtest::Text;
 
 constexpr uint32_t kCluster = 0x10000, kFrame = 0x20000, kSignal = 0x30000;
 
@@ -42,12 +44,6 @@ struct cHostText {
   ~cHostText() { svDisposeHandle(handle); }
   SvHandle handle;
 };
-
-std::string Read(SvHandle string) {
-  char text[256];
-  svsimReadString(string, text, sizeof text);
-  return text;
-}
 
 class DbReferences : public testing::Test {
  protected:
@@ -312,9 +308,7 @@ TEST_F(DbReferences, TextsOfObjectsInEveryOutputMode) {
     output.handle = &array;
     ASSERT_EQ(BuildReferenceStrings(cluster, kvPropClst_FrmRefs, kvPropFrm_Name, output,
                                     kReferenceArray, 1), 0);
-    ASSERT_EQ(ArrayCount(array), 2);
-    EXPECT_EQ(Read(ArrayData8<SvHandle>(array)[0]), speed);
-    EXPECT_EQ(Read(ArrayData8<SvHandle>(array)[1]), brake);
+    EXPECT_EQ(kvsvtest::Texts(array), (std::vector<std::string>{speed, brake}));
     DisposeHandleArray(&array);
 
     ASSERT_EQ(BuildReferenceStrings(cluster, kvPropClst_FrmRefs, kvPropFrm_Name, output,
@@ -334,7 +328,7 @@ TEST_F(DbReferences, TextsOfObjectsInEveryOutputMode) {
 
     ASSERT_EQ(BuildReferenceStrings(cluster, kReferenceListSelf, kvPropClst_Name, output,
                                     kReferenceString, 1), 0);
-    EXPECT_EQ(Read(array), std::string(row.file) + "." + row.cluster);
+    EXPECT_EQ(Text(array), std::string(row.file) + "." + row.cluster);
     DisposeHandle(&array);
     EXPECT_EQ(kvdbCloseDatabase(database, 1), 0);
   }
