@@ -115,17 +115,64 @@ double TimeRounds(int64_t calls, Round round) {
   return ThreadCpuNs() - start;
 }
 
+struct tTimes {
+  double ourNs = 0, floorNs = 0;
+  uint64_t allocations = 0;  // of the host, in our rounds
+  bool failed = false;
+};
+
+// Runs the state's loop of `ours` after a first round that sizes every host object and must
+// satisfy `delivered`, and after every block of our rounds as many rounds of `floor`, untimed by
+// the state, so that a busy machine weighs on both alike.
+template <class Ours, class Delivered, class Floor>
+tTimes TimeBesideFloor(benchmark::State &state, Ours ours, Delivered delivered, Floor floor) {
+  constexpr int64_t kBlock = 64;
+  tTimes times;
+  if (!ours() || !delivered()) {
+    state.SkipWithError("the first round did not deliver what was written");
+    times.failed = true;
+    return times;
+  }
+  auto floorBlock = [&](int64_t rounds) {
+    const double start = ThreadCpuNs();
+    for (int64_t i = 0; i < rounds && !times.failed; ++i) times.failed = !floor();
+    times.floorNs += ThreadCpuNs() - start;
+  };
+  int64_t inBlock = 0;
+  uint64_t allocationsBefore = HostAllocations();
+  double start = ThreadCpuNs();
+  for (auto _ : state) {
+    if (!ours()) {
+      times.failed = true;
+      break;
+    }
+    if (++inBlock < kBlock) continue;
+    times.ourNs += ThreadCpuNs() - start;
+    times.allocations += HostAllocations() - allocationsBefore;
+    state.PauseTiming();
+    floorBlock(inBlock);
+    state.ResumeTiming();
+    inBlock = 0;
+    allocationsBefore = HostAllocations();
+    start = ThreadCpuNs();
+  }
+  times.ourNs += ThreadCpuNs() - start;
+  times.allocations += HostAllocations() - allocationsBefore;
+  floorBlock(inBlock);
+  if (times.failed) state.SkipWithError("a round failed");
+  return times;
+}
+
 // Items per call, our time and the floor's over the same calls, and the host allocations of our
 // loop. `items_per_second` is Google Benchmark's own rate; the counters are this thread's.
-inline void ReportBesideFloor(benchmark::State &state, int64_t itemsPerCall, double ourNs,
-                              double floorNs, uint64_t allocations, const char *floorName = "floor") {
+inline void ReportBesideFloor(benchmark::State &state, int64_t itemsPerCall, const tTimes &t) {
   const double calls = static_cast<double>(state.iterations());
   const double items = calls * static_cast<double>(itemsPerCall);
   state.SetItemsProcessed(state.iterations() * itemsPerCall);
-  state.counters["per_second"] = items / (ourNs * 1e-9);
-  state.counters[std::string(floorName) + "_per_second"] = items / (floorNs * 1e-9);
-  state.counters[std::string("ratio_to_") + floorName] = ourNs / floorNs;
-  state.counters["host_allocs_per_call"] = static_cast<double>(allocations) / calls;
+  state.counters["per_second"] = items / (t.ourNs * 1e-9);
+  state.counters["floor_per_second"] = items / (t.floorNs * 1e-9);
+  state.counters["ratio_to_floor"] = t.ourNs / t.floorNs;
+  state.counters["host_allocs_per_call"] = static_cast<double>(t.allocations) / calls;
 }
 
 // Frames, or samples, per call.
