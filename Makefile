@@ -2,7 +2,8 @@
 # make test   installs what is missing, builds, runs every test under AddressSanitizer and
 #             UndefinedBehaviorSanitizer, the concurrency tests under ThreadSanitizer, and each
 #             fuzz target for a fixed number of runs; prints its total time at the end
-# make bench  builds and runs the benchmarks (optimised build)
+# make bench  builds and runs the benchmarks (optimised build), writes their JSON to bench-out/,
+#             runs the python-can peer when its Debian package is there, and draws bench-out/bench.svg
 # make stress runs the soak for STRESS_SECONDS under AddressSanitizer and UndefinedBehaviorSanitizer,
 #             then under ThreadSanitizer; fails if either run fails
 
@@ -14,7 +15,7 @@ CMAKE_FLAGS := -G Ninja -DKVSV_WERROR=ON
 SANITIZER_FLAGS := $(CMAKE_FLAGS) -DCMAKE_BUILD_TYPE=Debug -DCMAKE_C_FLAGS_DEBUG=-g1 \
         -DCMAKE_CXX_FLAGS_DEBUG=-g1 -DKVSV_BUILD_DEMO=OFF
 
-.PHONY: all deps build demo test test-asan test-tsan test-fuzz bench stress stress-asan stress-tsan \
+.PHONY: all deps build demo test test-asan test-tsan test-fuzz bench bench-deps stress stress-asan stress-tsan \
         clean
 
 all: build
@@ -65,11 +66,27 @@ test: deps
 	$(MAKE) --no-print-directory test-asan test-tsan test-fuzz; status=$$?; \
 	echo "make test: $$(( $$(date +%s) - start )) s in all"; exit $$status
 
-bench: deps
+# The peer of the end-to-end benchmarks; its absence only skips the peer.
+PEER_PYTHON ?= /usr/bin/python3
+
+bench-deps: deps
+	@dpkg -s python3-can >/dev/null 2>&1 || { \
+	  if [ "$$(id -u)" -eq 0 ]; then sudo=""; else sudo="sudo"; fi; \
+	  { $$sudo apt-get update -q && $$sudo env DEBIAN_FRONTEND=noninteractive apt-get install -y -q python3-can; } || \
+	  echo "python3-can could not be installed: the peer will be skipped"; }
+
+bench: bench-deps
 	cmake -S . -B build-bench $(CMAKE_FLAGS) -DCMAKE_BUILD_TYPE=Release -DKVSV_BUILD_TESTS=OFF \
 	  -DKVSV_BUILD_DEMO=OFF -DKVSV_BUILD_BENCH=ON
 	cmake --build build-bench -j $(JOBS)
-	./build-bench/bench/kvsvbench
+	mkdir -p bench-out
+	./build-bench/bench/kvsvbench --benchmark_out=bench-out/kvsvbench.json \
+	  --benchmark_out_format=json
+	@rm -f bench-out/python_can_peer.json; \
+	if $(PEER_PYTHON) -c "import can" 2>/dev/null; then \
+	  $(PEER_PYTHON) bench/python_can_peer.py --frames 200000 | tee bench-out/python_can_peer.json; \
+	else echo "python-can peer skipped: python3-can is not installed"; fi
+	python3 bench/plot_bench.py bench-out
 
 STRESS_SECONDS ?= 60
 
@@ -93,4 +110,4 @@ stress: deps
 	exit $$status
 
 clean:
-	rm -rf build build-asan build-tsan build-bench build-fuzz build-stress-asan build-stress-tsan
+	rm -rf bench-out build build-asan build-tsan build-bench build-fuzz build-stress-asan build-stress-tsan
