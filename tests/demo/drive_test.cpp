@@ -228,22 +228,28 @@ TEST(Drive, PartnerInterfacesAndValuesOnWholeRawSteps) {
   EXPECT_EQ(std::make_pair(s.FractionOf(-100.0), s.FractionOf(1000.0)), std::make_pair(0.0, 1.0));
 }
 
+// Both database tours on the tesla file, with the driver's aliases kept in a directory of the
+// test's own.
+class DatabaseTour : public testing::Test {
+ protected:
+  void SetUp() override { kvsimReset(); }
+
+  const kvsvtest::cTempDir directory_;
+  const kvsvtest::cScopedEnv config_{"KVSIM_CONFIG_DIR", directory_.Sub("config")};
+  const std::string dbc_ = KVSV_DBC_DIR "/tesla_can.dbc";
+  const std::string text_ = kvsvtest::ReadFile(dbc_);
+};
+
 // The database tour of the demonstration on a real file: the cluster's frames by reference, the
 // texts the library builds for what it creates, the edit saved and reloaded, and nothing left
 // open or registered when the program's references end.
-TEST(DatabaseTour, EditsSavesAndReloadsThroughTheExportsAndLeavesNothingOpen) {
-  const kvsvtest::cTempDir directory;
-  const kvsvtest::cScopedEnv config("KVSIM_CONFIG_DIR", directory.Sub("config"));
-  kvsimReset();
-  const std::string dbc = KVSV_DBC_DIR "/tesla_can.dbc";
+TEST_F(DatabaseTour, EditsSavesAndReloadsThroughTheExportsAndLeavesNothingOpen) {
   const tDatabaseTour t =
-      RunDatabaseTour(LinkedExports(), dbc, directory.Path(), "DAS_control", "DAS_setSpeed");
+      RunDatabaseTour(LinkedExports(), dbc_, directory_.Path(), "DAS_control", "DAS_setSpeed");
   ASSERT_EQ(t.status, 0) << t.failedCall;
-
-  const std::string text = kvsvtest::ReadFile(dbc);
   const std::regex frameLine(R"(\nBO_ \d+ (\w+) *:)");
   std::vector<std::string> frames;
-  for (std::sregex_iterator it(text.begin(), text.end(), frameLine), end; it != end; ++it)
+  for (std::sregex_iterator it(text_.begin(), text_.end(), frameLine), end; it != end; ++it)
     frames.push_back((*it)[1].str() + "\ntesla");
   EXPECT_EQ(t.clusterFrames, frames);
   EXPECT_EQ(t.scheduleReference, "DemoSchedule\ntesla");
@@ -257,19 +263,13 @@ TEST(DatabaseTour, EditsSavesAndReloadsThroughTheExportsAndLeavesNothingOpen) {
 
 // The property tour on a real file: every signal of the frame reads as the file's own line, a
 // changed factor is in the saved file, and a PDU mapping written is read back.
-TEST(DatabaseTour, ReadsSignalsAsTheFileWritesThemAndKeepsWhatItChanges) {
-  const kvsvtest::cTempDir directory;
-  const kvsvtest::cScopedEnv config("KVSIM_CONFIG_DIR", directory.Sub("config"));
-  kvsimReset();
-  const std::string dbc = KVSV_DBC_DIR "/tesla_can.dbc";
-  const tPropertyTour t = RunPropertyTour(LinkedExports(), dbc, directory.Path(), "DAS_control");
+TEST_F(DatabaseTour, ReadsSignalsAsTheFileWritesThemAndKeepsWhatItChanges) {
+  const tPropertyTour t = RunPropertyTour(LinkedExports(), dbc_, directory_.Path(), "DAS_control");
   ASSERT_EQ(t.status, 0) << t.failedCall;
-
-  const std::string text = kvsvtest::ReadFile(dbc);
-  const size_t frame = text.find("BO_ 697 DAS_control:");
+  const size_t frame = text_.find("BO_ 697 DAS_control:");
   const std::regex signalLine(R"re(^ SG_ (\w+) : (.*) \w+$)re");
   std::vector<std::string> expected, read;
-  std::istringstream lines(text.substr(text.find('\n', frame) + 1));
+  std::istringstream lines(text_.substr(text_.find('\n', frame) + 1));
   std::smatch m;
   for (std::string line; std::getline(lines, line) && std::regex_match(line, m, signalLine);)
     expected.push_back(m[1].str() + " " + m[2].str());

@@ -489,8 +489,6 @@ TEST_F(PropertyTest, DatabaseObjectsAreWrittenFromTheirReferenceTexts) {
     std::vector<uint32_t> sent;  // empty: nothing sent
   } cases[] = {
       {ecuId, {"Dash\n:memory:.Body"}, 0, {dash}},
-      {ecuId, {""}, kvErrDbReferenceEmpty, {}},
-      {ecuId, {"Da.sh\n:memory:.Body"}, kvErrDbReferenceTooDeep, {}},
       {ecuId, {"Gear\n:memory:.Body"}, kvsimErrObjectNotFound, {}},
       {kvPropSession_IntfName, {"Dash\n:memory:.Body"}, kvErrInternal, {}},
       {framesId, {"Speed\n:memory:.Body", "Gear  :memory:.Body"}, 0, {speed, gear}},
