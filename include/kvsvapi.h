@@ -26,6 +26,9 @@ typedef int32_t kvsvStatus;
 /* Host data: a handle points to a master pointer, which points to a relocatable block. */
 typedef void **SvHandle;
 
+/* Host path: the host's own record, reached only through its pointer. */
+struct SvPathRecord;
+
 /* Counted string, the block of a host string handle. */
 typedef struct SvStr {
   int32_t cnt;
@@ -704,9 +707,9 @@ KVSV_EXPORT kvsvStatus kvsvSessionSetPropExRef1D(uint32_t session, SvHandle *sub
 KVSV_EXPORT kvsvStatus kvsvSessionSetPropRef1D(uint32_t session, uint32_t id, SvHandle *value,
                                                SvHandle *info);
 
-/* Paths: a text property that names a file, as a host path (the host's SvPath). Get sets the text of *value, or
- * makes the path into a null *value; a path the host cannot make is an internal error,
- * 0xBFF63001. Set sends the path's text, "" for a null or empty path. Ex forms only. */
+/* Paths: a text property that names a file, as a host path (the host's SvPath). Get sets the
+ * text of *value, or makes the path into a null *value; a path the host cannot make is an
+ * internal error, 0xBFF63001. Set sends the path's text, "" for a null or empty path. Ex forms only. */
 KVSV_EXPORT kvsvStatus kvsvSessionGetPropExPath(uint32_t session, SvHandle *subId, uint32_t id,
                                                 struct SvPathRecord **value, SvHandle *info);
 KVSV_EXPORT kvsvStatus kvsvSessionSetPropExPath(uint32_t session, SvHandle *subId, uint32_t id,
