@@ -23,8 +23,7 @@ uint64_t ArrayBytes(int32_t n, uint32_t width) {
 
 }  // namespace
 
-Status FitPayload(SvHandle payload, uint32_t length, int32_t payloadMax) {
-  if (svGetHandleSize(payload) >= uint64_t{length} + kPayloadHeader) return 0;
+Status GrowPayload(SvHandle payload, uint32_t length, int32_t payloadMax) {
   SvHandle grown = payload;
   return ResizeOrCreateHandle(
       &grown, static_cast<uint64_t>(std::max<int64_t>(PayloadHandleBytes(payloadMax),

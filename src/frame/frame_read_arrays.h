@@ -37,7 +37,12 @@ inline bool CapacityHolds(uint64_t capacity, int32_t payloadMax) {
 // for the others only while a host program keeps them alike; one that is too small is grown here
 // as new handles are made, to the session's `payloadMax` (or the length, if that is more), so that
 // no copy runs past it. 0 when it fits; otherwise the resize helper's failure, the handle as it was.
-Status FitPayload(SvHandle payload, uint32_t length, int32_t payloadMax);
+Status GrowPayload(SvHandle payload, uint32_t length, int32_t payloadMax);
+inline Status FitPayload(SvHandle payload, uint32_t length, int32_t payloadMax) {
+  // Inline, so that the walk pays one size query per frame and no call of its own.
+  if (svGetHandleSize(payload) >= uint64_t{length} + kPayloadHeader) return 0;
+  return GrowPayload(payload, length, payloadMax);
+}
 
 class cFrameArrays {
  public:
