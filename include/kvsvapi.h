@@ -107,6 +107,10 @@ KVSV_EXPORT void kvsvSvTimeTo1nsTime(uint64_t *result, const SvTime *value);
 /* Cookie of a reference registered with the host. */
 typedef uint64_t kvsvRefnum;
 
+/* A session handle reaches the library's record of the session by its low 16 bits alone, so that
+ * no call waits on a lookup. A program must not use a handle after its session has ended: a later
+ * session whose handle has the same low 16 bits would receive the call. */
+
 /* 1 while a project session is open, else 0 (manual sessions do not count). Not a status. */
 KVSV_EXPORT int32_t kvsvGetIsProjectSessionOpen(void);
 
@@ -336,7 +340,10 @@ KVSV_EXPORT kvsvStatus kvsvReadFrameEthernetEx(uint32_t session, int32_t numFram
  * limit in a single-point session, else its queue size) and needs a `timeout` of 0.0 (else
  * 0xBFF630A0). `timeout` as for the other reads. The count is the bytes the driver gave, 0 if it
  * was not called. 0xBFF63015: `data` is null. 0xBFF63020, 0xBFF63027 as for the other reads.
- * 0xBFF630B0: the host could not grow the array. Otherwise the driver's status. */
+ * 0xBFF630B0: the host could not grow the array. Otherwise the driver's status.
+ * A program must not mix this read with the decoded reads above on one session: both keep their
+ * sizes in the same place of the session's cache, in different units, so that the amounts then
+ * asked of the driver are wrong (the array's real size is still checked before every copy). */
 KVSV_EXPORT kvsvStatus kvsvReadFrameRaw(uint32_t session, int32_t numBytes, SvHandle *data,
                                         double timeout);
 
