@@ -187,6 +187,31 @@ TEST_F(DbReferences, ManualOpensAndTheirClosesOneByOneOrAllAtOnce) {
   EXPECT_EQ(kvdbCloseDatabase(refused, 0), 0);
 }
 
+// A failed automatic open still hands the host an object, which answers with the failure; the
+// account keeps it only where a database was found, and its close leaves nothing behind.
+TEST_F(DbReferences, AFailedAutomaticOpenGivesAnObjectThatCarriesItsFailure) {
+  const struct {
+    const char *text;
+    int32_t status;
+    uint32_t kept;  // databases in the account while the object lives
+  } cases[] = {{"Speed\nnowhere", kvsimErrDatabaseNotFound, 0},
+               {"Nothing\nbody.Body", kvsimErrObjectNotFound, 1}};
+  for (const auto &c : cases) {
+    SCOPED_TRACE(c.text);
+    cHostText text(c.text);
+    uint32_t handle = 0;
+    EXPECT_EQ(kvsvdbAutoOpenDbObject(&text.handle, kFrame, &handle, 0), c.status);
+    ASSERT_NE(handle, 0u);
+    uint32_t value = 0;
+    EXPECT_EQ(kvdbGetProperty(handle, kvPropFrm_ID, sizeof value, &value), c.status);
+    EXPECT_EQ(kvsvGetNumOpenDatabases(), before_ + c.kept);
+    kvsvdbAutoCloseDbObject(handle);
+    EXPECT_EQ(kvdbGetProperty(handle, kvPropFrm_ID, sizeof value, &value),
+              kvsimErrInvalidDatabase) << "closed";
+  }
+  EXPECT_EQ(kvsimLoadedDatabaseCount(), 0);
+}
+
 TEST_F(DbReferences, ManualCloseGivesTheFirstFailureInItsOrder) {
   const int32_t driverFailure = kvsimErrInternal;
   struct {
