@@ -2,13 +2,12 @@
 // from the reference texts by which a host holds them. Each text is resolved to an object handle
 // for the driver, and every handle so opened is closed again before the export returns.
 #include <cstdint>
-#include <cstdlib>
-#include <memory>
 
 #include "core/host_handles.h"
 #include "core/internal_error.h"
 #include "core/status.h"
 #include "database/find_by_reference_string.h"
+#include "database/resolved_references.h"
 #include "kvorproperties.h"
 #include "kvsvapi.h"
 #include "property/annotate_property_status.h"
@@ -24,10 +23,6 @@ constexpr uint32_t kLineRefIsText = 1590;
 constexpr uint32_t kLineRefNotSchedule = 1621;
 constexpr uint32_t kLineRef1DIsText = 1787;
 constexpr uint32_t kLineRef1DUnknown = 1826;
-
-struct tFreeHandles {
-  void operator()(uint32_t *block) const { std::free(block); }
-};
 
 Status Report(uint32_t line, uint32_t info) {
   return ReportInternalError(kComponentKvsvapi, nFile::kDatabaseProperties, line, info);
@@ -84,21 +79,10 @@ Status WriteReferences(uint32_t object, uint32_t id, const SvHandle *value) {
     const Status reported = Report(kLineRef1DUnknown, id);
     if (reported < 0) return reported;
   }
-  const auto count = static_cast<uint32_t>(ArrayCount(*value));
-  // Cleared, so that the close below passes over the entries never resolved.
-  std::unique_ptr<uint32_t, tFreeHandles> handles(
-      static_cast<uint32_t *>(std::calloc(count, sizeof(uint32_t))));
-  if (!handles) return kvErrOutOfMemory;
-  const SvHandle *texts = ArrayData8<SvHandle>(*value);
-  Status status = 0;
-  for (uint32_t i = 0; i < count && status >= 0; ++i) {
-    uint32_t database = 0;
-    status = FindDbObjectByReferenceString(texts[i], elementClass, &database, &handles.get()[i]);
-  }
-  if (status >= 0) {
-    status = tDbPropertyCalls::Set(object, id, count * uint32_t{sizeof(uint32_t)}, handles.get());
-  }
-  for (uint32_t i = 0; i < count; ++i) CloseObject(handles.get()[i]);
+  cResolvedReferences objects;
+  Status status = objects.Resolve(ArrayData8<SvHandle>(*value),
+                                  static_cast<uint32_t>(ArrayCount(*value)), elementClass);
+  if (status >= 0) status = tDbPropertyCalls::Set(object, id, objects.Bytes(), objects.Objects());
   return status;
 }
 

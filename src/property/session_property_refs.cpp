@@ -3,11 +3,10 @@
 // name, an interface by its name, a database object by its reference text; the driver sees
 // handles.
 #include <cstdint>
-#include <cstdlib>
-#include <memory>
 
 #include "core/internal_error.h"
 #include "database/find_by_reference_string.h"
+#include "database/resolved_references.h"
 #include "kvorproperties.h"
 #include "kvsvapi.h"
 #include "property/session_property_call.h"
@@ -70,29 +69,16 @@ Status WriteEcu(uint32_t session, uint32_t id, const SvHandle *value) {
   return set;
 }
 
-// Frames from their reference texts, as handles to the driver. Each resolve leaves its database
-// open until the write is done; a failed one ends the walk and nothing is written.
+// Frames from their reference texts, as handles to the driver. A failed resolve ends the walk
+// and nothing is written.
 Status WriteFrames(uint32_t handle, uint32_t id, const SvHandle *value) {
   const int32_t count =
       value != nullptr && *value != nullptr && **value != nullptr ? ArrayCount(*value) : 0;
   if (count <= 0) return tSessionPropertyCalls::Set(handle, id, 0, nullptr);
-  const uint32_t bytes = static_cast<uint32_t>(count) * sizeof(uint32_t);
-  std::unique_ptr<uint32_t, void (*)(void *)> frames(static_cast<uint32_t *>(std::malloc(bytes)),
-                                                     std::free);
-  if (!frames) return kvErrOutOfMemory;
-  Status status = 0;
-  int32_t written = 0;
-  while (written < count && status >= 0) {
-    uint32_t database = 0;
-    status = FindDbObjectByReferenceString(ArrayData8<SvHandle>(*value)[written], kClassFrame,
-                                           &database, &frames.get()[written]);
-    ++written;
-  }
-  if (status >= 0) status = tSessionPropertyCalls::Set(handle, id, bytes, frames.get());
-  // Only the entries written hold handles; their closes' statuses are not the write's.
-  for (int32_t i = 0; i < written; ++i) {
-    if (frames.get()[i] != 0) kvdbCloseDatabase(frames.get()[i], 0);
-  }
+  cResolvedReferences frames;
+  Status status =
+      frames.Resolve(ArrayData8<SvHandle>(*value), static_cast<uint32_t>(count), kClassFrame);
+  if (status >= 0) status = tSessionPropertyCalls::Set(handle, id, frames.Bytes(), frames.Objects());
   return status;
 }
 
