@@ -21,12 +21,6 @@ constexpr uint32_t kLineRefUnknown = 1535;
 constexpr uint32_t kLineRef1DIsText = 1676;
 constexpr uint32_t kLineRef1DUnknown = 1744;
 
-// Cluster references of signals, subframes and LIN schedule entries; the driver gives them no
-// public name.
-constexpr uint32_t kSigClusterRef = 0x05030034u;
-constexpr uint32_t kSubfrmClusterRef = 0x05040006u;
-constexpr uint32_t kLinSchedEntryClusterRef = 0x05070009u;
-
 struct tNameOf {
   uint32_t listProperty;
   uint32_t nameProperty;
@@ -35,11 +29,11 @@ struct tNameOf {
 constexpr tNameOf kSingleNames[] = {
     {kvPropClst_DatabaseRef, kvPropDatabase_Name},
     {kvPropFrm_ClusterRef, kvPropClst_Name},
-    {kSigClusterRef, kvPropClst_Name},
-    {kSubfrmClusterRef, kvPropClst_Name},
+    {kSignalClusterRef, kvPropClst_Name},
+    {kSubframeClusterRef, kvPropClst_Name},
     {kvPropECU_ClstRef, kvPropClst_Name},
     {kvPropLINSched_ClstRef, kvPropClst_Name},
-    {kLinSchedEntryClusterRef, kvPropClst_Name},
+    {kLinScheduleEntryClusterRef, kvPropClst_Name},
     {kvPropPDU_ClusterRef, kvPropClst_Name},
     {kvPropFrm_MuxDataMuxSigRef, kvPropSig_NameUniqueToCluster},
     {kvPropPDU_MuxDataMuxSigRef, kvPropSig_NameUniqueToCluster},

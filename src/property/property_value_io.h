@@ -8,6 +8,7 @@
 #include <cstdint>
 #include <cstdlib>
 #include <cstring>
+#include <new>
 
 #include "core/host_handles.h"
 #include "core/status.h"
@@ -78,6 +79,30 @@ Status ReadArrayProperty(uint32_t object, uint32_t id, SvHandle *value) {
 
 // Text into a block of our own: size, allocation, read. The block gets a NUL behind the
 // driver's bytes, so that it is a C string even if the driver's text was cut.
+// The 4-byte handles that list property `listId` of `object` holds into `list` (a scoped array),
+// or `object` alone when `listId` is `self`. A failed or empty read leaves `count` 0 and gives the
+// read's status.
+template <class tCalls, class tList>
+Status ReadHandleList(uint32_t object, uint32_t listId, uint32_t self, tList &list,
+                      uint32_t &count) {
+  count = 0;
+  if (listId == self) {
+    list.reset(new (std::nothrow) uint32_t[1]);
+    if (!list) return kvErrOutOfMemory;
+    list[0] = object;
+    count = 1;
+    return 0;
+  }
+  uint32_t size = 0;
+  Status status = tCalls::GetSize(object, listId, &size);
+  if (status < 0 || size / sizeof(uint32_t) == 0) return status;
+  list.reset(new (std::nothrow) uint32_t[size / sizeof(uint32_t)]);
+  if (!list) return kvErrOutOfMemory;
+  status = tCalls::Get(object, listId, size, list.get());
+  if (status >= 0) count = size / sizeof(uint32_t);
+  return status;
+}
+
 template <class tCalls>
 Status ReadTextBlock(uint32_t object, uint32_t id, tMallocBlock &block) {
   uint32_t size = 0;

@@ -19,27 +19,6 @@ constexpr uint64_t kDeviceNameBytes = 32;
 // Bytes that a name's string handle holds beyond the driver's size of the name.
 constexpr uint32_t kNameSlack = 12;
 
-// The objects to name, from the driver or `handle` alone.
-Status ReadHandleList(uint32_t handle, uint32_t listId, std::unique_ptr<uint32_t[]> &list,
-                      uint32_t &count) {
-  count = 0;
-  if (listId == kSystemRefsSelf) {
-    list.reset(new (std::nothrow) uint32_t[1]);
-    if (!list) return kvErrOutOfMemory;
-    list[0] = handle;
-    count = 1;
-    return 0;
-  }
-  uint32_t size = 0;
-  Status status = tSessionPropertyCalls::GetSize(handle, listId, &size);
-  if (status < 0 || size / sizeof(uint32_t) == 0) return status;
-  list.reset(new (std::nothrow) uint32_t[size / sizeof(uint32_t)]);
-  if (!list) return kvErrOutOfMemory;
-  status = tSessionPropertyCalls::Get(handle, listId, size, list.get());
-  if (status >= 0) count = size / sizeof(uint32_t);
-  return status;
-}
-
 void SetCount(SvHandle string, int32_t count) { static_cast<SvStr *>(*string)->cnt = count; }
 
 // A name property of `object` into a new string handle, its count leaving the NUL out. The
@@ -69,7 +48,8 @@ Status SystemRefsFromProperty(uint32_t handle, uint32_t listId, uint32_t nameId,
                               uint32_t mode) {
   std::unique_ptr<uint32_t[]> list;
   uint32_t count = 0;
-  Status status = ReadHandleList(handle, listId, list, count);
+  Status status =
+      ReadHandleList<tSessionPropertyCalls>(handle, listId, kSystemRefsSelf, list, count);
   if (status < 0 || count == 0) return status;
 
   if (mode == kSystemRefsArray) {

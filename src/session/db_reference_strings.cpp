@@ -18,11 +18,6 @@ constexpr uint32_t kLineLocationClass = 1177;
 constexpr uint32_t kLineOneStringOnly = 1569;
 constexpr uint32_t kLineOutputMode = 1575;
 
-// Cluster references that the driver serves without a name of their own.
-constexpr uint32_t kSignalClusterRef = 0x05030034u;
-constexpr uint32_t kSubframeClusterRef = 0x05040006u;
-constexpr uint32_t kLinScheduleEntryClusterRef = 0x05070009u;
-
 // The cluster the driver writes for a database without clusters of its own: never written out.
 constexpr char kDefaultCluster[] = "Cluster";
 
@@ -49,26 +44,6 @@ uint32_t ClusterRefProperty(uint32_t objectClass) {
 uint32_t ClassOfProperty(uint32_t id) { return id & 0xFF0000u; }
 
 SvStr *Text(SvHandle string) { return static_cast<SvStr *>(*string); }
-
-// The list of objects to name: the object alone, or what its list property holds. A failed or
-// empty read leaves an empty list and gives the read's status.
-Status ReadObjectList(uint32_t object, uint32_t listProperty, cReferenceArrayWork &work) {
-  if (listProperty == kReferenceListSelf) {
-    work.objects.reset(new (std::nothrow) uint32_t[1]);
-    if (!work.objects) return kvErrOutOfMemory;
-    work.objects[0] = object;
-    work.count = 1;
-    return 0;
-  }
-  uint32_t size = 0;
-  Status status = kvdbGetPropertySize(object, listProperty, &size);
-  if (status < 0 || size / sizeof(uint32_t) == 0) return status;
-  work.objects.reset(new (std::nothrow) uint32_t[size / sizeof(uint32_t)]);
-  if (!work.objects) return kvErrOutOfMemory;
-  status = kvdbGetProperty(object, listProperty, size, work.objects.get());
-  if (status >= 0) work.count = size / sizeof(uint32_t);
-  return status;
-}
 
 // Makes the output ready for `count` texts.
 Status PrepareOutput(tReferenceOutput output, uint32_t mode, uint32_t count) {
@@ -168,7 +143,8 @@ void StoreText(tReferenceOutput output, uint32_t mode, uint32_t index, SvHandle 
 Status BuildReferenceStrings(uint32_t object, uint32_t listProperty, uint32_t nameProperty,
                              tReferenceOutput output, uint32_t mode, uint32_t qualify) {
   cReferenceArrayWork work;
-  const Status listed = ReadObjectList(object, listProperty, work);
+  const Status listed = ReadHandleList<tDbPropertyCalls>(object, listProperty, kReferenceListSelf,
+                                                        work.objects, work.count);
   Status status = PrepareOutput(output, mode, work.count);
   if (status < 0) return status;
 

@@ -20,6 +20,11 @@ enum eReferenceOutput : uint32_t {
   kReferenceText = 3       // into *text, separated by ','
 };
 
+// Cluster references that the driver serves without a name of their own.
+constexpr uint32_t kSignalClusterRef = 0x05030034u;
+constexpr uint32_t kSubframeClusterRef = 0x05040006u;
+constexpr uint32_t kLinScheduleEntryClusterRef = 0x05070009u;
+
 // The list property that stands for the object alone.
 constexpr uint32_t kReferenceListSelf = 0xFFFFFFFFu;
 
