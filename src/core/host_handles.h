@@ -40,6 +40,12 @@ void *GrowHandleArray(SvHandle *array, uint32_t extra, uint32_t *capacityOut);
 // Disposes each element of an array of handles, then the array.
 void DisposeHandleArray(SvHandle *array);
 
+// Whether the string handle `string` holds at least one character: a null handle or block, or a
+// count of 0 or less, is no text.
+inline bool HasText(SvHandle string) {
+  return string != nullptr && *string != nullptr && static_cast<const SvStr *>(*string)->cnt > 0;
+}
+
 // A failed read keeps the host's count, unless the resize before it left the block too small to
 // hold that many bytes: then the string is emptied rather than left to be read past its end. A
 // null handle is left alone.

@@ -1,6 +1,7 @@
 // The host's own open and close of a database object's reference, by its text: the automatic
 // road. A failed open still gives a handle, an error object that carries the failure to the first
 // use of the reference.
+#include "core/host_handles.h"
 #include "core/status.h"
 #include "database/db_life_manager.h"
 #include "database/find_by_reference_string.h"
@@ -10,10 +11,7 @@ using namespace nKVSVAPI100;
 
 namespace {
 
-bool HasText(const SvHandle *name) {
-  return name != nullptr && *name != nullptr && **name != nullptr &&
-         static_cast<const SvStr *>(**name)->cnt > 0;
-}
+bool HasText(const SvHandle *name) { return name != nullptr && nKVSVAPI100::HasText(*name); }
 
 }  // namespace
 

@@ -4,6 +4,7 @@
 #include <mutex>
 #include <new>
 
+#include "core/host_handles.h"
 #include "core/internal_error.h"
 #include "kvsvplatform.h"
 
@@ -21,9 +22,6 @@ constexpr uint32_t kLineNextOutsideWalk = 577;
 constexpr uint32_t kLineRemoveDatabase = 633;
 constexpr uint32_t kLineRemoveChildren = 672;
 
-bool HasText(SvHandle name) {
-  return name != nullptr && *name != nullptr && static_cast<const SvStr *>(*name)->cnt > 0;
-}
 
 std::string TextOf(SvHandle name) {
   if (!HasText(name)) return std::string();

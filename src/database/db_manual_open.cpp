@@ -1,4 +1,5 @@
 // A program's own open of a database object by its text: the manual road.
+#include "core/host_handles.h"
 #include "core/status.h"
 #include "database/db_life_manager.h"
 #include "database/find_by_reference_string.h"
@@ -9,8 +10,7 @@ using namespace nKVSVAPI100;
 
 extern "C" KVSV_EXPORT kvsvStatus kvsvdbManualOpen(uint32_t objectClass, SvHandle name,
                                                    kvsvRefnum *reference) {
-  if (name == nullptr || *name == nullptr || static_cast<const SvStr *>(*name)->cnt <= 0)
-    return kvErrDbReferenceEmpty;
+  if (!HasText(name)) return kvErrDbReferenceEmpty;
   cDbLifeManager &manager = GetDbLifeManager();
   tDbObject object{0, 0, objectClass, 0};
   // Found or not, the lookup leaves the manager locked for the add that follows.

@@ -33,10 +33,7 @@ void CloseObject(uint32_t handle) {
   if (handle != 0) kvdbCloseDatabase(handle, 0);
 }
 
-bool IsEmptyText(const SvHandle *value) {
-  return value == nullptr || *value == nullptr || **value == nullptr ||
-         static_cast<const SvStr *>(**value)->cnt <= 0;
-}
+bool IsEmptyText(const SvHandle *value) { return value == nullptr || !HasText(*value); }
 
 bool IsEmptyArray(const SvHandle *value) {
   return value == nullptr || *value == nullptr || **value == nullptr || ArrayCount(*value) <= 0;
