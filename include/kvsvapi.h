@@ -297,8 +297,11 @@ KVSV_EXPORT kvsvStatus kvsvWriteFrameRaw(uint32_t session, SvHandle data, double
  * 0xBFF63015: `frames` or `spareHandles` is null. Otherwise the driver's status, with the frames
  * it delivered. The Ex forms return 0 at once, touching nothing, when `*skip` is non-zero.
  * The arrays may go to several sessions in turn and may hold handles of the program's own: a
- * payload handle too small for the frame it gets is grown first. A program must not put one
- * handle in two places of the arrays, nor touch the arrays or their handles while a read runs. */
+ * payload handle too small for the frame it gets is grown first. A handle is taken to hold at
+ * least the bytes its count claims, as every host array does: a read asks the host for a handle's
+ * size only when the frame is longer. A program must not put one handle in two places of the
+ * arrays, nor give a payload handle a count larger than its block, nor touch the arrays or their
+ * handles while a read runs. */
 
 /* CAN frames, in the session's form: classic, CAN FD up to its payload limit, or J1939 messages
  * of up to 1785 bytes. 0xBFF63090: a single-point session read for fewer frames than its list. */

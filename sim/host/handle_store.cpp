@@ -35,6 +35,7 @@ void FreeBlock(void *block, size_t size) {
 }  // namespace
 
 std::atomic<uintptr_t> HandleStore::slabs_[HandleStore::kSlabSlots];
+std::atomic<uint64_t> HandleStore::sizeQueries_{0};
 
 HandleStore &HandleStore::Instance() {
   // Never destroyed: the library may still dispose of handles from static destructors at exit.
@@ -169,6 +170,7 @@ void HandleStore::ResetCounters() {
   allocations_ = 0;
   resizes_ = 0;
   frees_ = 0;
+  sizeQueries_.store(0, std::memory_order_relaxed);
 }
 
 void HandleStore::Reset() {
@@ -178,6 +180,7 @@ void HandleStore::Reset() {
   allocations_ = 0;
   resizes_ = 0;
   frees_ = 0;
+  sizeQueries_.store(0, std::memory_order_relaxed);
 }
 
 }  // namespace svhost

@@ -31,6 +31,11 @@ class HandleStore {
   static size_t Size(SvHandle handle, const char *operation) {
     return Find(handle, operation).size.load(std::memory_order_relaxed);
   }
+  // Size as a program asks it, counted, so that tests can tell how often the library asks.
+  static size_t QueriedSize(SvHandle handle) {
+    sizeQueries_.fetch_add(1, std::memory_order_relaxed);
+    return Size(handle, "svGetHandleSize");
+  }
   void Dispose(SvHandle handle, const char *operation);
 
   void SetMoveOnResize(bool on);
@@ -39,6 +44,7 @@ class HandleStore {
   uint64_t Allocations();
   uint64_t Resizes();
   uint64_t Frees();
+  static uint64_t SizeQueries() { return sizeQueries_.load(std::memory_order_relaxed); }
   uint64_t Live();
   void ResetCounters();
   // Counters, move mode and resize error back to their defaults; live handles stay.
@@ -100,6 +106,7 @@ class HandleStore {
   // Zero before any code runs and reached without a pointer to the store, so that the size query
   // is a few loads; hidden, so that it is not reached through the symbol table either.
   __attribute__((visibility("hidden"))) static std::atomic<uintptr_t> slabs_[kSlabSlots];
+  __attribute__((visibility("hidden"))) static std::atomic<uint64_t> sizeQueries_;
   std::mutex mutex_;
   size_t slabCount_ = 0;
   Master *fresh_ = nullptr;  // the rest of the newest slab, never handed out yet

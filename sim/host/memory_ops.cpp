@@ -18,7 +18,7 @@ int32_t svSetHandleSizeClr(SvHandle handle, size_t size) {
 
 size_t svGetHandleSize(SvHandle handle) {
   if (handle == nullptr) return 0;
-  return HandleStore::Size(handle, "svGetHandleSize");
+  return HandleStore::QueriedSize(handle);
 }
 
 int32_t svDisposeHandle(SvHandle handle) {
@@ -51,6 +51,7 @@ void svCopyBytes(const void *source, void *destination, size_t size) {
 uint64_t svsimAllocCount(void) { return HandleStore::Instance().Allocations(); }
 uint64_t svsimResizeCount(void) { return HandleStore::Instance().Resizes(); }
 uint64_t svsimFreeCount(void) { return HandleStore::Instance().Frees(); }
+uint64_t svsimHandleSizeQueries(void) { return HandleStore::SizeQueries(); }
 uint64_t svsimLiveHandles(void) { return HandleStore::Instance().Live(); }
 void svsimSetMoveOnResize(int32_t on) { HandleStore::Instance().SetMoveOnResize(on != 0); }
 void svsimSetResizeError(int32_t code) { HandleStore::Instance().SetResizeError(code); }

@@ -58,12 +58,15 @@ uint64_t svsimReset(void);
 /* ---- Handles -------------------------------------------------------------------------------
  * Counts since the last reset (svsimReset or svsimResetCounters): handles made (by any operation
  * that makes one, including the helpers below), resizes done, handles disposed. Failed operations
- * are not counted. svsimLiveHandles is the number of handles alive now, whatever the resets. */
+ * are not counted. svsimHandleSizeQueries counts the calls of svGetHandleSize with a handle.
+ * svsimLiveHandles is the number of handles alive now, whatever the resets. */
 uint64_t svsimAllocCount(void);
 uint64_t svsimResizeCount(void);
 uint64_t svsimFreeCount(void);
+uint64_t svsimHandleSizeQueries(void);
 uint64_t svsimLiveHandles(void);
-/* Zeroes the made, resized and disposed counts and the injected fault count only. */
+/* Zeroes the made, resized and disposed counts, the size queries and the injected fault count
+ * only. */
 void svsimResetCounters(void);
 
 /* Non-zero: every resize moves the block (new block, contents copied, old block overwritten and

@@ -39,7 +39,10 @@ inline bool CapacityHolds(uint64_t capacity, int32_t payloadMax) {
 // no copy runs past it. 0 when it fits; otherwise the resize helper's failure, the handle as it was.
 Status GrowPayload(SvHandle payload, uint32_t length, int32_t payloadMax);
 inline Status FitPayload(SvHandle payload, uint32_t length, int32_t payloadMax) {
-  // Inline, so that the walk pays one size query per frame and no call of its own.
+  // A host array's block always holds the elements its count claims, so a handle that counts
+  // `length` bytes already takes them: a steady read, which finds the lengths of the last one
+  // again, asks the host nothing per frame. Only a longer payload costs a size query.
+  if (int64_t{ArrayCount(payload)} >= int64_t{length}) return 0;
   if (svGetHandleSize(payload) >= uint64_t{length} + kPayloadHeader) return 0;
   return GrowPayload(payload, length, payloadMax);
 }

@@ -228,8 +228,10 @@ TEST_F(ConvertTest, AHostThatShrinksOrDropsItsArraysGetsThemBuiltAgain) {
   SvHandle in = Keep(ValueArray(kTeslaValues));
   const struct {
     const char *what;
-    size_t first, size;  // payload handles from `first` on are cut to `size` bytes, if not 0
-    int reads;           // of the frame count, 1 when the arrays are built again
+    // Payload handles from `first` on are cut to `size` bytes, if not 0, and their counts to
+    // what is left, as a host cuts an array.
+    size_t first, size;
+    int reads;  // of the frame count, 1 when the arrays are built again
   } cases[] = {{"the last payload handle too small for its 8 bytes, the first as large as ever",
                 2, 5, 0},
                {"payload handles too small for the limit", 0, 9, 1},
@@ -237,8 +239,10 @@ TEST_F(ConvertTest, AHostThatShrinksOrDropsItsArraysGetsThemBuiltAgain) {
   for (const auto &c : cases) {
     SCOPED_TRACE(c.what);
     const std::vector<SvHandle> payloads = out.Payloads();
-    for (size_t i = c.first; i < payloads.size() && c.size != 0; ++i)
+    for (size_t i = c.first; i < payloads.size() && c.size != 0; ++i) {
       ASSERT_EQ(svSetHandleSizeClr(payloads[i], c.size), 0);
+      *static_cast<int32_t *>(*payloads[i]) = static_cast<int32_t>(c.size) - 4;
+    }
     if (c.size == 0) out.Dispose();
     kvsimLogClear();
     ASSERT_EQ(kvsvConvertSignalSinglePointToFrameCAN(session, &in, &out.frames, &out.spares), 0);

@@ -214,6 +214,45 @@ TEST_F(FrameTest, ReadOfCanFdGrowsTheHandlesThatAClassicReadAddedToTheSameArrays
   EXPECT_EQ(svsimAllocCount(), 0u);
 }
 
+// A steady read finds frames no longer than those its handles hold already: it asks the host for
+// no handle's size per frame, so the number of size queries of a call does not grow with its
+// frames.
+TEST_F(FrameTest, SteadyReadAsksForNoPayloadHandleSizePerFrame) {
+  const struct {
+    const tProtocol *p;
+    uint32_t property;
+    uint8_t length;
+    uint32_t recordBytes;
+  } cases[] = {{&kCan, 0, 8, 24},
+               {&kCan, kvPropSession_IntfCanIoMode, 64, 80},
+               {&kLin, 0, 8, 24},
+               {&kFlexRay, 0, 254, 272}};
+  const int32_t counts[] = {1, 40};
+  for (const auto &c : cases) {
+    SCOPED_TRACE(testing::Message() << c.p->name << " " << int{c.length});
+    uint64_t queries[2] = {};
+    for (int k = 0; k < 2; ++k) {
+      Open(*c.p, c.property);
+      const auto serve = [&](uint8_t seed) {
+        tBytes records;
+        for (int32_t i = 0; i < counts[k]; ++i)
+          records = Join({records, Record(0x100 + i, 0, 0, 0, c.length,
+                                          Pattern(c.length, uint8_t(seed + i)), c.recordBytes)});
+        Serve(records);
+      };
+      serve(0);
+      ASSERT_EQ(Read(counts[k]), 0);
+      svsimResetCounters();
+      serve(50);
+      ASSERT_EQ(Read(counts[k]), 0);
+      ASSERT_EQ(Frames(), counts[k]);
+      EXPECT_EQ(arrays_->PayloadOf(counts[k] - 1), Pattern(c.length, uint8_t(50 + counts[k] - 1)));
+      queries[k] = svsimHandleSizeQueries();
+    }
+    EXPECT_EQ(queries[0], queries[1]);
+  }
+}
+
 TEST_F(FrameTest, ReadOfAllTakesTheWholeQueueOrWhatIsPendingNow) {
   const struct {
     const tProtocol *p;

@@ -65,8 +65,10 @@ TEST_F(Host, CountersCountWhatSucceededAndOnlyTheNthOperationFails) {
   EXPECT_EQ(svSetHandleSizeClr(a, 24), -108);
   EXPECT_EQ(*a, block) << "a failed resize leaves the block";
   EXPECT_EQ(svGetHandleSize(a), 16u);
+  EXPECT_EQ(svGetHandleSize(nullptr), 0u);
   EXPECT_EQ(svSetHandleSizeClr(a, 32), 0);
   EXPECT_EQ(svsimInjectedFaults(), 2u);
+  EXPECT_EQ(svsimHandleSizeQueries(), 1u) << "only a program's queries of a handle count";
   EXPECT_EQ(svsimAllocCount(), 4u);
   EXPECT_EQ(svsimResizeCount(), 4u);
   const uint64_t live = svsimLiveHandles();
