@@ -27,7 +27,7 @@ class HandleStore {
   // names the caller in the message of a fatal stop, here and below.
   int32_t Resize(SvHandle handle, size_t size, const char *operation);
   // Size of a live handle. Aborts on a handle that is not live. Takes no lock and is inline, since
-  // the library asks it for every frame it copies, as a real host answers it from a block header.
+  // the library may ask it for many frames of a call, as a real host answers it from a block header.
   static size_t Size(SvHandle handle, const char *operation) {
     return Find(handle, operation).size.load(std::memory_order_relaxed);
   }

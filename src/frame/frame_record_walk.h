@@ -7,7 +7,6 @@
 
 #include <cstdint>
 
-#include "core/host_handles.h"
 #include "core/internal_error.h"
 #include "core/status.h"
 #include "frame/frame_decode.h"
@@ -60,34 +59,22 @@ int32_t WalkRecords(const cFrameArrays &arrays, uint8_t *records, uint32_t bytes
     }
     kDecode(record, arrays.Element(i));
     if (payload != nullptr) {
+      uint32_t length = 0;
       if constexpr (kRule == ePayloadRule::kClip) {
         if (record[kRecordPayloadLength] > payloadMax) {
           status = kvErrPayloadTruncated;
           record[kRecordPayloadLength] = static_cast<uint8_t>(payloadMax);
         }
-        const uint8_t length = record[kRecordPayloadLength];
-        const Status fitted = FitPayload(payload, length, payloadMax);
-        if (fitted < 0) {
-          status = fitted;
-        } else {
-          StorePayload(payload, record + kRecordPayload, length);
-        }
+        length = record[kRecordPayloadLength];
       } else {
-        const uint32_t length = RecordPayloadLength(record);
-        bool fits = true;
-        if (static_cast<int64_t>(length) > payloadMax &&
-            svGetHandleSize(payload) < uint64_t{length} + kPayloadHandleExtra) {
-          // A long message may exceed the session's limit; its handle keeps the larger size.
-          status = ResizeOrCreateHandle(&payload, uint64_t{length} + kPayloadHandleExtra);
-          fits = status == 0;
-          if (fits) arrays.Payload(i) = payload;
-        }
-        if (fits) {
-          const Status fitted = FitPayload(payload, length, payloadMax);
-          if (fitted < 0) status = fitted;
-          fits = fitted >= 0;
-        }
-        if (fits) StorePayload(payload, record + kRecordPayload, length);
+        // A long message may exceed the session's limit; its handle grows to take it whole.
+        length = RecordPayloadLength(record);
+      }
+      const Status fitted = FitPayload(payload, length, payloadMax);
+      if (fitted < 0) {
+        status = fitted;
+      } else {
+        StorePayload(payload, record + kRecordPayload, length);
       }
     }
     if constexpr (kForm == eRecordForm::kVariable) offset += RecordSize(RecordPayloadLength(record));
