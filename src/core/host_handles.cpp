@@ -13,7 +13,8 @@ namespace {
 constexpr uint32_t kGrowMargin = 20;
 constexpr uint32_t kCommaListModeLine = 782;
 
-// A string handle holding `length` bytes of `text`, or null.
+}  // namespace
+
 SvHandle NewStringHandle(const char *text, size_t length) {
   SvHandle string = svNewHandleClr(length + 8);
   if (string == nullptr) return nullptr;
@@ -22,8 +23,6 @@ SvHandle NewStringHandle(const char *text, size_t length) {
   std::memcpy(block->str, text, length);
   return string;
 }
-
-}  // namespace
 
 void ZeroArrayCount(SvHandle h) {
   if (h != nullptr && *h != nullptr) ArrayCount(h) = 0;

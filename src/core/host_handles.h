@@ -51,6 +51,9 @@ inline bool HasText(SvHandle string) {
 // null handle is left alone.
 void KeepStringCountInBlock(SvHandle string);
 
+// A new string handle holding `length` bytes of `text`, or null when the host has no memory.
+SvHandle NewStringHandle(const char *text, size_t length);
+
 // Copies a counted string. Null `source` gives 0xBFF63015; out of memory 0xBFF63010.
 Status StringFromSvStr(std::string &target, const SvStr *source);
 

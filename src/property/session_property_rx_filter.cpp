@@ -6,6 +6,7 @@
 #include <cstring>
 #include <memory>
 
+#include "core/host_handles.h"
 #include "core/internal_error.h"
 #include "kvorproperties.h"
 #include "kvsvapi.h"
@@ -53,13 +54,9 @@ Status ToCluster(const tEnetRxFilterRecord &record, tEnetRxFilterCluster &elemen
   element.useValue8 = (record.flags & kEnetRxFilterValue8) != 0;
   element.value8 = record.value8;
   element.useName = (record.flags & kEnetRxFilterName) != 0;
-  const size_t length = strnlen(record.filterName, kEnetRxFilterNameBytes);
-  element.filterName = svNewHandleClr(length + 8);
-  if (element.filterName == nullptr) return kvErrOutOfMemory;
-  auto *name = static_cast<SvStr *>(*element.filterName);
-  std::memcpy(name->str, record.filterName, length);
-  name->cnt = static_cast<int32_t>(length);
-  return 0;
+  element.filterName =
+      NewStringHandle(record.filterName, strnlen(record.filterName, kEnetRxFilterNameBytes));
+  return element.filterName != nullptr ? 0 : kvErrOutOfMemory;
 }
 
 Status ReadFilter(uint32_t handle, uint32_t id, SvHandle *value) {
