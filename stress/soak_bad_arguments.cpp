@@ -80,7 +80,9 @@ class cSystemObjects {
   std::vector<SvHandle> names_;
 };
 
-// A session of this thread's own, ended at once: its number stays ended for the whole run.
+// A session of this thread's own, ended at once. One is made each round: the driver hands a
+// slot number out again after going round all of them, and an ended number that lands on a live
+// session reaches that session's slot.
 uint32_t EndedSession(cSoakThread &thread) {
   kvsvRefnum reference = 0;
   kvsvSessionManualCreate(":memory:", "", "", "CAN2", kvMode_FrameInQueued, &reference);
@@ -96,7 +98,7 @@ void RunBadArguments(std::vector<tPair> &pairs, const tRunFlags &flags, uint32_t
                      cSoakThread &thread) {
   std::minstd_rand random(seed);
   cSystemObjects objects(thread);
-  const uint32_t ended = EndedSession(thread);
+  uint32_t ended = 0;
   cReadArrays arrays;
   cWriteArray empty(1), oversized(1), frame(1);
   empty.SetCount(0);
@@ -173,6 +175,7 @@ void RunBadArguments(std::vector<tPair> &pairs, const tRunFlags &flags, uint32_t
   };
 
   while (flags.running.load()) {
+    ended = EndedSession(thread);
     for (const tCase &c : cases) {
       pair = &pairs[random() % pairs.size()];
       const int32_t status = thread.Call(c.name, c.call);
@@ -204,6 +207,15 @@ void RunBadArguments(std::vector<tPair> &pairs, const tRunFlags &flags, uint32_t
     thread.Doing("pausing between rounds");
     std::this_thread::sleep_for(std::chrono::milliseconds(1));
   }
+}
+
+bool ReachedByStrangers(uint32_t session) {
+  const uint32_t slot = session & 0xFFFFu;
+  // Devices 0x01SSDD00 and their interfaces 0x01SSDD0P, DD 1 or 2, reach slots DD00 to DD0F.
+  const uint32_t device = slot >> 8;
+  const bool systemObject = (device == 1 || device == 2) && (slot & 0xF0u) == 0;
+  return systemObject || slot == (kDatabaseHandle & 0xFFFFu) ||
+         slot == (kFrameObjectHandle & 0xFFFFu);
 }
 
 }  // namespace nKvsvSoak

@@ -15,6 +15,12 @@ namespace nKvsvSoak {
 void RunBadArguments(std::vector<tPair> &pairs, const tRunFlags &flags, uint32_t seed,
                      cSoakThread &thread);
 
+// Whether a handle of another class that this thread passes (a device, an interface, a database
+// object) reaches the slot of `session`. The library finds a session's slot by the low 16 bits of
+// a number alone, so a call with such a handle acts on that slot as its program's own: the pairs
+// keep their traffic off these slots, as a program must keep its sessions' numbers to itself.
+bool ReachedByStrangers(uint32_t session);
+
 }  // namespace nKvsvSoak
 
 #endif

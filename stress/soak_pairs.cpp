@@ -7,6 +7,7 @@
 
 #include "kvorproperties.h"
 #include "kvsvplatform.h"
+#include "soak_bad_arguments.h"
 #include "soak_host_arrays.h"
 #include "soak_violations.h"
 #include "svsim.h"
@@ -59,8 +60,9 @@ uint32_t HandleOfReference(kvsvRefnum reference) {
   return 0;
 }
 
-bool OpenSession(tPair &pair, tSessionEnd &end, cSoakThread &thread) {
-  kvsvRefnum reference = 0;
+// A new session of `end` with its host reference; 0, with a violation, if there is none.
+uint32_t MakeSession(const tSessionEnd &end, kvsvRefnum &reference, cSoakThread &thread) {
+  reference = 0;
   const int32_t made = thread.Call("kvsvSessionManualCreate", [&] {
     return kvsvSessionManualCreate(":memory:", "", "", end.interfaceName, end.mode, &reference);
   });
@@ -71,8 +73,22 @@ bool OpenSession(tPair &pair, tSessionEnd &end, cSoakThread &thread) {
     Violation(thread.Name(), std::string("no session on ") + end.interfaceName + ": " +
                                  StatusText(made));
     if (reference != 0) kvsvSessionClear(handle, reference);
-    return false;
+    return 0;
   }
+  return handle;
+}
+
+bool OpenSession(tPair &pair, tSessionEnd &end, cSoakThread &thread) {
+  kvsvRefnum reference = 0;
+  uint32_t handle = MakeSession(end, reference, thread);
+  // The driver hands out the next number each time, so the next session lands elsewhere.
+  while (handle != 0 && ReachedByStrangers(handle)) {
+    Expect(thread, thread.Call("kvsvSessionClear", [&] {
+      return kvsvSessionClear(handle, reference);
+    }), 0, "clearing a session whose slot handles of other classes reach");
+    handle = MakeSession(end, reference, thread);
+  }
+  if (handle == 0) return false;
   if (pair.kind.flexibleDataRate) {
     const uint32_t on = 1;
     Expect(thread, thread.Call("kvsvSessionSetPropU32", [&] {
